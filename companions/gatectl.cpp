@@ -1,0 +1,3 @@
+#include <windows.h>
+
+int WINAPI WinMain(HINSTANCE inst, HINSTANCE previous, LPSTR command_line, int show) { return 0; }

@@ -1,0 +1,119 @@
+// The simulated machine: a small PC with PCI/AGP graphics cards, their VGA
+// cores and chip models, the two driver devices, the video BIOS and the
+// display driver of Windows 95, 98 or NT 4.0. It implements the machine
+// seam (src/hardware/machine.h) for vistrel-sim.exe and the tests.
+//
+// This header is what tests and the simulation's own programs use to build a
+// machine and look inside it. The program itself never includes it.
+#ifndef VISTREL_SIM_H
+#define VISTREL_SIM_H
+
+#include <windows.h>
+#include <stdint.h>
+#include <stdio.h>
+
+enum SimWindows {
+    SIM_WINDOWS_95 = 95,
+    SIM_WINDOWS_98 = 98,
+    SIM_WINDOWS_NT4 = 4,
+};
+
+enum { SIM_MAX_CARDS = 8, SIM_MAX_INITIAL_REGISTERS = 64, SIM_DESCRIPTION_SIZE = 64 };
+
+// A register file of a card, as simstate.exe names them.
+enum SimRegisterFile {
+    SIM_REG_CRTC,       // CRxx: CRT controller, 0x3D4/0x3D5
+    SIM_REG_SEQUENCER,  // SRxx: sequencer, 0x3C4/0x3C5
+    SIM_REG_GRAPHICS,   // GRxx: graphics controller, 0x3CE/0x3CF
+    SIM_REG_ATTRIBUTE,  // ARxx: attribute controller, 0x3C0/0x3C1
+    SIM_REG_MISC,       // MISC: miscellaneous output, written 0x3C2, read 0x3CC (index ignored)
+    SIM_REG_FAMILY,     // the family's own register file, by index (later families)
+};
+
+struct SimInitialRegister {
+    SimRegisterFile file;
+    uint16_t index;
+    uint8_t value;
+};
+
+struct SimCardConfig {
+    uint16_t vendor_id;
+    uint16_t device_id;
+    uint8_t bus;          // 0, or 1 behind the AGP bridge
+    uint8_t device;       // PCI device number 0..31
+    uint32_t memory_mb;   // video memory
+    bool display_device;  // Windows 98 has a display device and a monitor for it
+    bool device_node;     // Windows 9x has a Config Manager device node for it
+    uint32_t problem;     // that node's "Problem" value; 0 = none
+    bool has_edid;
+    uint8_t edid[128];    // the monitor's EDID base block
+    char driver_desc[SIM_DESCRIPTION_SIZE];  // "" = the usual description for the chip
+    int initial_register_count;
+    SimInitialRegister initial_registers[SIM_MAX_INITIAL_REGISTERS];  // applied after the card's reset values
+};
+
+struct SimMachineConfig {
+    int windows;  // SimWindows
+    int card_count;
+    SimCardConfig cards[SIM_MAX_CARDS];
+    int primary_card;  // the card that decodes the legacy VGA ports; -1 = none
+    // The desktop mode the machine boots into.
+    uint16_t start_width, start_height, start_bits, start_refresh;
+    // Windows 98: at most this many display devices and monitors; 0 = one for
+    // every card with display_device.
+    int monitors;
+    bool nt_device;   // NT: the kernel device "\\.\Zentra" is installed
+    bool vxd_device;  // 9x: "\\.\HWGATE.VXD" can be loaded
+};
+
+// One S3 Trio64V2 (5333:8901) on bus 0 device 10 with 4 MB and a 17-inch
+// monitor of 1998, on Windows 98, booting into 1024x768 at 16 bits, 75 Hz.
+void SimDefaultMachine(SimMachineConfig* config);
+// A card with the defaults of the description file's [Card<n>] section.
+void SimDefaultCard(SimCardConfig* card, uint16_t vendor_id, uint16_t device_id);
+// Reads a machine description (SIMMACHINE.INI format, see sim/README.md) over
+// the defaults. Returns 1 when the file exists, 0 when the defaults stand.
+int SimReadDescription(const char* path, SimMachineConfig* config);
+
+// Boots a machine held in this process's memory, as tests do: resets every
+// card, seeds the registry of that Windows, and puts the display into the
+// start-up mode.
+void SimBoot(const SimMachineConfig* config);
+// vistrel-sim.exe's machine: the state lives in the Wine prefix, keyed by
+// the folder of the executable, and outlives the process; a description
+// whose bytes changed since the last boot boots the machine afresh.
+// Returns 1 when the machine is up.
+int SimAttachPersistent(const char* exe_folder);
+// simstate.exe: looks at the persistent machine of a folder without booting
+// it. Returns 0 when that machine has never run.
+int SimOpenPersistent(const char* exe_folder);
+
+// Looking inside.
+const SimMachineConfig* SimConfig();
+uint8_t SimReadRegister(int card, SimRegisterFile file, uint16_t index);
+void SimWriteRegister(int card, SimRegisterFile file, uint16_t index, uint8_t value);
+double SimPixelClockHz(int card);   // the DCLK synthesizer's output
+double SimMemoryClockHz(int card);  // the MCLK synthesizer's output
+int SimHTotal(int card);            // in character clocks, 0 when unknown
+int SimVTotal(int card);            // in lines, 0 when unknown
+double SimRefreshHz(int card);      // 0 when the model cannot tell
+enum SimDpms { SIM_DPMS_ON, SIM_DPMS_STANDBY, SIM_DPMS_SUSPEND, SIM_DPMS_OFF };
+SimDpms SimDpmsState(int card);
+// The depth the display driver last set on the card.
+int SimCardDepth(int card);
+// The whole state as simstate.exe prints it.
+void SimPrintState(FILE* out);
+
+// Counters of what crossed the seam, for tests and the benchmark.
+struct SimCounters {
+    uint32_t port_reads, port_writes;
+    uint32_t window_reads, window_writes;
+    uint32_t device_opens, device_requests;
+    uint32_t enum_settings_calls;  // EnumDisplaySettingsA of any mode number
+    uint32_t enum_settings_walks;  // ... of mode number 0: the start of a walk
+    uint32_t mode_changes;
+};
+const SimCounters* SimGetCounters();
+void SimResetCounters();
+
+#endif

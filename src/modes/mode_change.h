@@ -1,0 +1,21 @@
+// Changing the refresh rate and the display mode.
+#ifndef VISTREL_MODE_CHANGE_H
+#define VISTREL_MODE_CHANGE_H
+
+#include <windows.h>
+#include <stdint.h>
+
+int SetRefreshRate(int target);
+int ProgramRefreshClock(int rate);
+void SyncRefreshRate(int at_startup);
+LONG ApplyDisplayMode(HWND owner, DWORD mask, int width, int height, int bits, int dpi_x, int dpi_y, int refresh);
+
+// What the Desktop page has selected.
+struct DesktopSelection {
+    int width, height, bits;
+    int dpi_x, dpi_y;
+    int refresh;
+};
+int ApplyDesktopPage(HWND page, DesktopSelection* selection);
+
+#endif

@@ -1,0 +1,3 @@
+#ifndef VISTREL_TEST_SUPPORT_H
+#define VISTREL_TEST_SUPPORT_H
+#endif

@@ -1,0 +1,3 @@
+# Test executables (one per folder) and the runs CTest makes of them.
+vistrel_test(shell)
+vistrel_add_test(shell shell)
