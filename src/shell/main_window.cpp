@@ -82,7 +82,7 @@ LRESULT OnPowerStateMessage(WPARAM state)
 {
     // Any process can send this message: anything but a DPMS state would
     // reach every card as an arbitrary chip command.
-    if (state > 0xFFFFFFFFu || !IsDpmsState((uint32_t)state)) return 1;
+    if (state != (uint32_t)state || !IsDpmsState((uint32_t)state)) return 1;
     chip_set_dpms_all((uint32_t)state);
     return 1;
 }

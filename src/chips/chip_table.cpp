@@ -1,0 +1,106 @@
+#include "chips/chips.h"
+
+#include <windows.h>
+
+#include "chips/families.h"
+#include "hardware/adapters.h"
+#include "shell/globals.h"
+
+#define S3_FAMILY S3Dispatch, S3SetPixelClock, S3GetPixelClock
+#define UNSUPPORTED_FAMILY UnsupportedDispatch, UnsupportedSetPixelClock, UnsupportedGetPixelClock
+
+const ChipRow chip_table[CHIP_TABLE_ROWS] = {
+    {0x12d2, 0x0018, UNSUPPORTED_FAMILY},  // Riva 128
+    {0x12d2, 0x0019, UNSUPPORTED_FAMILY},  // Riva 128ZX
+    {0x10de, 0x0020, UNSUPPORTED_FAMILY},  // Riva TNT
+    {0x8086, 0x7800, UNSUPPORTED_FAMILY},  // i740
+    {0x121a, 0x0003, UNSUPPORTED_FAMILY},  // Voodoo Banshee
+    {0x1023, 0x939a, UNSUPPORTED_FAMILY},  // Trident 939a
+    {0x5333, 0x8a13, S3_FAMILY},           // Trio3D/2X
+    {0x5333, 0x8a20, S3_FAMILY},           // Savage3D
+    {0x5333, 0x8a21, S3_FAMILY},           // Savage3D/MV
+    {0x5333, 0x8904, S3_FAMILY},           // Trio3D
+    {0x5333, 0x5631, S3_FAMILY},           // ViRGE
+    {0x5333, 0x883d, S3_FAMILY},           // ViRGE/VX
+    {0x5333, 0x8a01, S3_FAMILY},           // ViRGE/DX or GX
+    {0x5333, 0x8a10, S3_FAMILY},           // ViRGE/GX2
+    {0x5333, 0x8811, S3_FAMILY},           // Trio32/Trio64
+    {0x5333, 0x8901, S3_FAMILY},           // Trio64V2
+    {0x104c, 0x3d07, UNSUPPORTED_FAMILY},  // TI Permedia 2
+    {0x3d3d, 0x0007, UNSUPPORTED_FAMILY},  // Permedia 2
+    {0x3d3d, 0x0009, UNSUPPORTED_FAMILY},  // Permedia 2v
+    {0x100c, 0x3208, UNSUPPORTED_FAMILY},  // ET6000
+};
+
+static const ChipRow* CurrentRow() { return &chip_table[CurrentAdapter()->chip_row]; }
+
+static uint32_t Command(uint32_t command, uintptr_t argument = 0) { return CurrentRow()->Dispatch(command, argument); }
+
+uint32_t chip_init() { return Command(CMD_INIT_CHIP); }
+uint32_t chip_open_io() { return Command(CMD_OPEN_IO); }
+uint32_t chip_close_io() { return Command(CMD_CLOSE_IO); }
+uint32_t chip_get_htotal() { return Command(CMD_GET_HTOTAL); }
+uint32_t chip_get_vtotal() { return Command(CMD_GET_VTOTAL); }
+uint32_t chip_get_char_width() { return Command(CMD_GET_CHAR_WIDTH); }
+
+uint32_t chip_write_port(uint32_t port, uint32_t value)
+{
+    return Command(CMD_WRITE_PORT, (value & 0xFFFF) << 16 | (port & 0xFFFF));
+}
+
+uint32_t chip_read_port(uint32_t port) { return Command(CMD_READ_PORT, port); }
+uint32_t chip_get_mem_size() { return Command(CMD_GET_MEM_SIZE); }
+
+void chip_prepare_mode(uint16_t width, uint16_t height, uint16_t bits, uint32_t refresh)
+{
+    ChipModeRecord mode = {width, height, bits, refresh};
+    Command(CMD_PREPARE_MODE, (uintptr_t)&mode);
+}
+
+uint32_t chip_hide_page(uint32_t page) { return Command(CMD_HIDE_PAGE, page); }
+
+uint32_t chip_map_registers()
+{
+    // Only Windows 9x lets the program reach a register window itself.
+    if (platform != PLATFORM_9X) return 0;
+    return Command(CMD_MAP_REGISTERS);
+}
+
+uint32_t chip_get_mem_type() { return Command(CMD_GET_MEM_TYPE); }
+uint32_t chip_is_interlaced() { return Command(CMD_IS_INTERLACED); }
+uint32_t chip_get_mclk() { return Command(CMD_GET_MCLK); }
+uint32_t chip_set_mclk(uint32_t mhz) { return Command(CMD_SET_MCLK, mhz); }
+uint32_t chip_get_agp_rate() { return Command(CMD_GET_AGP_RATE); }
+uint32_t chip_has_dpms() { return Command(CMD_HAS_DPMS); }
+uint32_t chip_get_mclk_max() { return Command(CMD_GET_MCLK_MAX); }
+uint32_t chip_get_mclk_min() { return Command(CMD_GET_MCLK_MIN); }
+uint32_t chip_set_pixel_clock(double hz) { return CurrentRow()->SetPixelClock(hz); }
+double chip_get_pixel_clock() { return CurrentRow()->GetPixelClock(); }
+
+bool IsDpmsState(uint32_t code)
+{
+    return code == CMD_DPMS_ON || code == CMD_DPMS_STANDBY || code == CMD_DPMS_SUSPEND || code == CMD_DPMS_OFF;
+}
+
+int any_chip_has_dpms()
+{
+    int16_t saved = current_adapter;
+    int found = 0;
+    for (current_adapter = 0; current_adapter < adapter_count; ++current_adapter) {
+        if (chip_has_dpms()) {
+            found = 1;
+            break;
+        }
+    }
+    current_adapter = saved;
+    return found;
+}
+
+int chip_set_dpms_all(uint32_t state)
+{
+    int16_t saved = current_adapter;
+    for (current_adapter = 0; current_adapter < adapter_count; ++current_adapter) Command(state);
+    current_adapter = saved;
+    if (state == CMD_DPMS_ON) InvalidateRect(NULL, NULL, TRUE);
+    return 1;
+}

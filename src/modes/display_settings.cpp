@@ -1,0 +1,60 @@
+#include "modes/display_settings.h"
+
+#include <string.h>
+#include <windows.h>
+
+#include "hardware/machine.h"
+
+enum { LISTED_MODES_KEPT = 2048 };
+
+static ListedMode listed[LISTED_MODES_KEPT];
+static int listed_count;
+static bool walked;      // listed[] holds the start of the list
+static bool truncated;   // the list goes on beyond what listed[] keeps
+
+static bool ReadMode(DWORD n, ListedMode* out)
+{
+    DEVMODEA mode;
+    memset(&mode, 0, sizeof mode);
+    mode.dmSize = sizeof mode;
+    if (!MachineEnumDisplaySettings(NULL, n, &mode)) return false;
+    out->width = (uint16_t)mode.dmPelsWidth;
+    out->height = (uint16_t)mode.dmPelsHeight;
+    out->bits_per_pixel = (uint16_t)mode.dmBitsPerPel;
+    out->frequency = (uint16_t)mode.dmDisplayFrequency;
+    const char* name = (const char*)mode.dmDeviceName;
+    out->vga_device = (name[0] | 0x20) == 'v' && (name[1] | 0x20) == 'g' && (name[2] | 0x20) == 'a';
+    return true;
+}
+
+static void Walk()
+{
+    listed_count = 0;
+    truncated = false;
+    ListedMode mode;
+    while (ReadMode((DWORD)listed_count, &mode)) {
+        if (listed_count == LISTED_MODES_KEPT) {
+            truncated = true;
+            break;
+        }
+        listed[listed_count++] = mode;
+    }
+    walked = true;
+}
+
+void ForEachListedMode(bool (*visit)(const ListedMode* mode, void* data), void* data)
+{
+    if (!walked) Walk();
+    for (int i = 0; i < listed_count; ++i)
+        if (!visit(&listed[i], data)) return;
+    // A list longer than what is kept is read on from the system each time.
+    ListedMode mode;
+    for (DWORD n = LISTED_MODES_KEPT; truncated && ReadMode(n, &mode); ++n)
+        if (!visit(&mode, data)) return;
+}
+
+void ForgetDisplaySettings()
+{
+    walked = false;
+    listed_count = 0;
+}

@@ -1,0 +1,237 @@
+// Changing the refresh rate of the current mode, and whole display modes.
+#include "modes/mode_change.h"
+
+#include <stdlib.h>
+#include <string.h>
+
+#include "adjust/position.h"
+#include "chips/chips.h"
+#include "hardware/adapters.h"
+#include "hardware/companions.h"
+#include "hardware/machine.h"
+#include "modes/font_size.h"
+#include "modes/mode_list.h"
+#include "shell/globals.h"
+#include "shell/settings.h"
+#include "shell/texts.h"
+
+// Capability bit: the rate asked for is not clamped to the mode list's maximum.
+enum { ADAPTER_UNCLAMPED_RATE = 0x0004 };
+enum { TITLE_SIZE = 40, MESSAGE_SIZE = 255 };
+static const DWORD interlaced_display_flag = 2;
+static const int nt_safe_rate = 60;
+
+static bool CloseEnough(int target, int current)
+{
+    int distance = abs(current - target);
+    if (target > 90) return distance <= 5;
+    return distance <= 3 || (target < 50 && current < 50);
+}
+
+// The rate to ask Windows for: the list's maximum stands for rates above it,
+// which the pixel clock then reaches.
+static int OsRequestRate(int target, int max)
+{
+    if (CurrentAdapter()->flags & ADAPTER_UNCLAMPED_RATE) return target;
+    return max < target ? max : target;
+}
+
+static void BuildModeRequest(DEVMODEA* mode, DWORD mask, int width, int height, int bits, int dpi, int frequency,
+                             bool interlaced)
+{
+    memset(mode, 0, sizeof *mode);
+    mode->dmSize = sizeof *mode;
+    lstrcpynA((char*)mode->dmDeviceName, CurrentAdapter()->device_name, sizeof mode->dmDeviceName);
+    mode->dmFields = mask;
+    mode->dmPelsWidth = (DWORD)width;
+    mode->dmPelsHeight = (DWORD)height;
+    mode->dmBitsPerPel = (DWORD)bits;
+    mode->dmLogPixels = (WORD)dpi;
+    mode->dmDisplayFrequency = (DWORD)frequency;
+    mode->dmDisplayFlags = interlaced ? interlaced_display_flag : 0;
+}
+
+static void SaveMode(int refresh, int width, int height, int bits)
+{
+    SaveSetting(SETTING_REFRESH, refresh);
+    SaveSetting(SETTING_BITS, bits);
+    SaveSetting(SETTING_WIDTH, width);
+    SaveSetting(SETTING_HEIGHT, height);
+}
+
+int SetRefreshRate(int target)
+{
+    if (target <= 1) return 0;
+    AdapterRecord* a = CurrentAdapter();
+    int current = MeasuredRefreshRate();
+    if (CloseEnough(target, current)) {
+        a->refresh_hz = (uint16_t)target;
+        return 1;
+    }
+    int max = MaxRefreshRate(a->width, a->height, a->bits_per_pixel);
+    int frequency = OsRequestRate(target, max);
+    if (current != frequency) {
+        DEVMODEA request;
+        BuildModeRequest(&request, DM_DISPLAYFREQUENCY, a->width, a->height, a->bits_per_pixel, 0, frequency,
+                         frequency < 50);
+        int saved = a->refresh_hz;
+        a->refresh_hz = REFRESH_CHANGE_MARKER;
+        // An NT miniport may refuse to go from one rate it cannot hold to
+        // another; a step through 60 Hz gets it there.
+        if (platform == PLATFORM_NT && max <= target && max <= saved) {
+            DEVMODEA safe = request;
+            safe.dmDisplayFrequency = nt_safe_rate;
+            safe.dmDisplayFlags = 0;
+            MachineChangeDisplaySettings(&safe, 0);
+        }
+        chip_prepare_mode(a->width, a->height, a->bits_per_pixel, (uint32_t)frequency);
+        LONG r = MachineChangeDisplaySettings(&request, CDS_UPDATEREGISTRY);
+        a->refresh_hz = (uint16_t)frequency;
+        if (r != DISP_CHANGE_SUCCESSFUL) return 0;
+    }
+    current = MeasuredRefreshRate();
+    if (max < target || abs(current - target) > 5) ProgramRefreshClock(target);
+    SaveMode(target, a->width, a->height, a->bits_per_pixel);
+    a->refresh_hz = (uint16_t)target;
+    return 1;
+}
+
+int ProgramRefreshClock(int rate)
+{
+    if (CurrentAdapter()->flags & (ADAPTER_NO_ADJUST | ADAPTER_NO_CLOCK_REFRESH)) return rate;
+    if (rate < 50) return 0;
+    if (!chip_open_io()) return 0;
+    uint32_t h = chip_get_htotal();
+    uint32_t v = chip_get_vtotal();
+    uint32_t c = chip_get_char_width();
+    double hz = (double)rate * c * h * v;
+    uint32_t ok = chip_set_pixel_clock(hz);
+    chip_close_io();
+    return ok ? rate : 0;
+}
+
+void SyncRefreshRate(int at_startup)
+{
+    AdapterRecord* a = CurrentAdapter();
+    if ((startup_flags & STARTUP_AUTORUN) && at_startup == 0) {
+        a->refresh_hz = (uint16_t)SavedRefreshRate();
+        a->refresh_hz = (uint16_t)NearestListedRefresh(a->refresh_hz);
+        if (a->refresh_hz == 0) a->refresh_hz = (uint16_t)MeasuredRefreshRate();
+        else SetRefreshRate(a->refresh_hz);
+        RestorePosition();
+    } else {
+        a->refresh_hz = (uint16_t)OsRefreshRate();
+        a->refresh_hz = (uint16_t)MeasuredRefreshRate();
+    }
+    if (a->refresh_hz == 0) a->refresh_hz = RATE_FALLBACK;
+}
+
+LONG ApplyDisplayMode(HWND owner, DWORD mask, int width, int height, int bits, int dpi_x, int dpi_y, int refresh)
+{
+    if (mask != DM_LOGPIXELS) mask |= DM_DISPLAYFREQUENCY;
+    AdapterRecord* a = CurrentAdapter();
+    int frequency = OsRequestRate(refresh, MaxRefreshRate(width, height, bits));
+    DEVMODEA request;
+    BuildModeRequest(&request, mask, width, height, bits, dpi_x, frequency,
+                     (mask & DM_DISPLAYFREQUENCY) && refresh < 50);
+    uint16_t saved = a->refresh_hz;
+    a->refresh_hz = REFRESH_CHANGE_MARKER;
+    chip_prepare_mode((uint16_t)width, (uint16_t)height, (uint16_t)bits, (uint32_t)frequency);
+    LONG r = MachineChangeDisplaySettings(&request, CDS_UPDATEREGISTRY);
+    a->refresh_hz = saved;
+    if (r == DISP_CHANGE_SUCCESSFUL || r == DISP_CHANGE_RESTART) {
+        // A change that waits for a restart leaves the old mode running.
+        if (r == DISP_CHANGE_SUCCESSFUL) {
+            a->bits_per_pixel = (uint16_t)bits;
+            a->width = (uint16_t)width;
+            a->height = (uint16_t)height;
+            a->refresh_hz = (uint16_t)frequency;
+        }
+        InvalidateRect(NULL, NULL, TRUE);
+        SaveSetting(SETTING_REFRESH, refresh);
+        SaveSetting(SETTING_WIDTH, width);
+        SaveSetting(SETTING_HEIGHT, height);
+        SaveSetting(SETTING_BITS, bits);
+    }
+    if (r == DISP_CHANGE_SUCCESSFUL && (mask & DM_DISPLAYFREQUENCY)) {
+        SetRefreshRate(refresh);
+        RestorePosition();
+    }
+    if ((mask & DM_LOGPIXELS) && (r == DISP_CHANGE_SUCCESSFUL || r == DISP_CHANGE_RESTART))
+        SwitchFontSize(dpi_x, dpi_y);
+    return r;
+}
+
+static int AskUser(HWND owner, const char* key, const char* fallback, UINT style)
+{
+    char title[TITLE_SIZE], text[MESSAGE_SIZE];
+    LoadText("DispChgTle", "Change Display Mode", title, sizeof title);
+    LoadText(key, fallback, text, sizeof text);
+    return MessageBoxA(owner, text, title, style);
+}
+
+static void EnableShutdownPrivilege()
+{
+    HANDLE token;
+    if (!OpenProcessToken(GetCurrentProcess(), TOKEN_ADJUST_PRIVILEGES | TOKEN_QUERY, &token)) return;
+    TOKEN_PRIVILEGES privileges;
+    privileges.PrivilegeCount = 1;
+    privileges.Privileges[0].Attributes = SE_PRIVILEGE_ENABLED;
+    if (LookupPrivilegeValueA(NULL, "SeShutdownPrivilege", &privileges.Privileges[0].Luid))
+        AdjustTokenPrivileges(token, FALSE, &privileges, 0, NULL, NULL);
+    CloseHandle(token);
+}
+
+static int OfferRestart(HWND owner)
+{
+    if (AskUser(owner, "RestartMsg",
+                "You need to restart windows to change settings. Do you want to restart now?",
+                MB_OKCANCEL | MB_ICONQUESTION) != IDOK)
+        return 1;
+    if (platform == PLATFORM_NT) {
+        EnableShutdownPrivilege();
+        restart_windows(EWX_REBOOT, 0);
+    } else {
+        GateRestart();
+    }
+    return 1;
+}
+
+int ApplyDesktopPage(HWND page, DesktopSelection* selection)
+{
+    const AdapterRecord* a = CurrentAdapter();
+    DesktopSelection before;
+    before.bits = a->bits_per_pixel;
+    before.width = a->width;
+    before.height = a->height;
+    before.refresh = a->refresh_hz;
+    HDC dc = GetDC(page);
+    before.dpi_x = GetDeviceCaps(dc, LOGPIXELSX);
+    before.dpi_y = GetDeviceCaps(dc, LOGPIXELSY);
+    ReleaseDC(page, dc);
+    if (platform == PLATFORM_NT && before.bits == 16 && NtDefaultBits() == 15) before.bits = 15;
+
+    DWORD mask = 0;
+    if (selection->bits != before.bits) mask |= DM_BITSPERPEL;
+    if (selection->width != before.width) mask |= DM_PELSWIDTH;
+    if (selection->height != before.height) mask |= DM_PELSHEIGHT;
+    if (selection->dpi_x != before.dpi_x || selection->dpi_y != before.dpi_y) mask |= DM_LOGPIXELS;
+    if (selection->refresh != before.refresh) mask |= DM_DISPLAYFREQUENCY;
+    if (!mask) return 0;
+
+    LONG r = ApplyDisplayMode(page, mask, selection->width, selection->height, selection->bits, selection->dpi_x,
+                              selection->dpi_y, selection->refresh);
+    if (r != DISP_CHANGE_SUCCESSFUL && r != DISP_CHANGE_RESTART) {
+        AskUser(page, "ChangeErr", "Cannot change to the specified display mode!", MB_ICONHAND);
+        return 0;
+    }
+    if (r == DISP_CHANGE_RESTART || mask == DM_LOGPIXELS) return OfferRestart(page);
+    if (AskUser(page, "DispConfirm", "Do you want to keep this settings?",
+                MB_OKCANCEL | MB_ICONQUESTION | MB_DEFBUTTON2) == IDOK) {
+        if (mask & DM_LOGPIXELS) return OfferRestart(page);
+        return 1;
+    }
+    *selection = before;
+    ApplyDisplayMode(page, mask, before.width, before.height, before.bits, before.dpi_x, before.dpi_y, before.refresh);
+    return 0;
+}

@@ -1,0 +1,260 @@
+// Which modes exist, which refresh rates each offers, and which rate is in
+// effect, for the current adapter.
+#include "modes/mode_list.h"
+
+#include <math.h>
+#include <stdio.h>
+#include <stdlib.h>
+#include <string.h>
+#include <windows.h>
+
+#include "chips/chips.h"
+#include "hardware/adapters.h"
+#include "hardware/machine.h"
+#include "modes/display_settings.h"
+#include "shell/globals.h"
+#include "shell/settings.h"
+
+ModeEntry* mode_table;
+
+enum { NO_LIST = -1, NEAREST_WINDOW = 19, LIST_WALK_LIMIT = 128 };
+static const int min_nt_frequency = 5;
+static const uint16_t table_depths[] = {8, 15, 16, 24, 32};
+
+struct ModeKey {
+    int width, height, bits;
+};
+
+// The OS rate list on NT: the frequencies the display driver lists for the
+// mode, leaving out the VGA driver's modes and "default" frequencies.
+struct NtRateSearch {
+    ModeKey mode;
+    int index;  // position wanted, or RATE_LAST
+    int seen;
+    int item;
+};
+
+static bool VisitNtRate(const ListedMode* m, void* data)
+{
+    NtRateSearch* s = (NtRateSearch*)data;
+    if (m->width != s->mode.width || m->height != s->mode.height || m->bits_per_pixel != s->mode.bits) return true;
+    if (m->vga_device || m->frequency < min_nt_frequency) return true;
+    if (s->index == RATE_LAST || s->seen == s->index) s->item = m->frequency;
+    ++s->seen;
+    return true;
+}
+
+// An item of a list: the rate, 0 when the list has no such item, or NO_LIST.
+// count, when given, receives the number of items of the list.
+static int NtOsRate(const ModeKey* mode, int index, int* count)
+{
+    NtRateSearch s = {*mode, index, 0, 0};
+    ForEachListedMode(VisitNtRate, &s);
+    if (s.seen == 0) return NO_LIST;
+    if (count) *count = s.seen;
+    return s.item;
+}
+
+static int TextRate(const char* text, int index, int* count)
+{
+    if (count) *count = CountRateListItems(text);
+    return ParseRateList(text, index);
+}
+
+static int OsRate(const ModeKey* mode, int index, int* count)
+{
+    if (platform == PLATFORM_NT) return NtOsRate(mode, index, count);
+    char text[RATE_LIST_TEXT_SIZE];
+    if (!ModeKeyRates(mode->width, mode->height, mode->bits, text, sizeof text)) return NO_LIST;
+    return TextRate(text, index, count);
+}
+
+static int ChipListRate(const ModeKey* mode, const char* suffix, int index, int* count)
+{
+    char section[32], key[32], text[RATE_LIST_TEXT_SIZE];
+    snprintf(section, sizeof section, platform == PLATFORM_NT ? "CHIP%04x_NT4%s" : "CHIP%04x_95%s",
+             CurrentAdapter()->device_id, suffix);
+    snprintf(key, sizeof key, "%dx%dx%d", mode->width, mode->height, mode->bits);
+    GetPrivateProfileStringA(section, key, "", text, sizeof text, chip_ini_path);
+    if (!text[0]) return NO_LIST;
+    return TextRate(text, index, count);
+}
+
+int RefreshRateAt(int index, int width, int height, int bits)
+{
+    ModeKey mode = {width, height, bits};
+    int base_count = 0;
+    int rate = OsRate(&mode, index, &base_count);
+    if (rate > 0) return rate;
+    if (rate == NO_LIST) {
+        rate = ChipListRate(&mode, "", index, &base_count);
+        if (rate > 0) return rate;
+        if (rate == NO_LIST) return 0;
+    }
+    if (CurrentAdapter()->flags & ADAPTER_NO_CLOCK_REFRESH) return 0;
+    if (index < base_count) return 0;
+    rate = ChipListRate(&mode, "E", index - base_count, NULL);
+    return rate > 0 ? rate : 0;
+}
+
+int CombinedRateRange(int width, int height, int bits, int* lowest, int* highest)
+{
+    *lowest = *highest = 0;
+    for (int i = 0; i < LIST_WALK_LIMIT; ++i) {
+        int rate = RefreshRateAt(i, width, height, bits);
+        if (rate <= 0) break;
+        if (!*lowest || rate < *lowest) *lowest = rate;
+        if (rate > *highest) *highest = rate;
+    }
+    return *highest > 0;
+}
+
+int MaxRefreshRate(int width, int height, int bits)
+{
+    ModeKey mode = {width, height, bits};
+    int rate = OsRate(&mode, RATE_LAST, NULL);
+    if (rate > 0) return rate;
+    rate = ChipListRate(&mode, "", RATE_LAST, NULL);
+    if (rate >= 1) return rate;
+    return NO_RATE_LIMIT;
+}
+
+int NearestListedRefresh(int target)
+{
+    if (target <= 0) return 0;
+    const AdapterRecord* a = CurrentAdapter();
+    int lower = 0, upper = 0;
+    for (int i = 0; i < LIST_WALK_LIMIT; ++i) {
+        int rate = RefreshRateAt(i, a->width, a->height, a->bits_per_pixel);
+        if (rate <= 0) return lower;
+        if (rate >= target) {
+            upper = rate;
+            break;
+        }
+        lower = rate;
+    }
+    if (!upper) return lower;
+    if (upper == target) return upper;
+    for (int d = 1; d <= NEAREST_WINDOW; ++d) {
+        if (lower + d >= target) return lower;
+        if (upper - d <= target) return upper;
+    }
+    return 0;
+}
+
+int OsRefreshRate()
+{
+    if (platform == PLATFORM_NT) {
+        int hz = MachineScreenRefresh();
+        if (hz < 10) return 0;  // 0 or 1: the driver's default timing
+        if (hz < 50) return RATE_INTERLACED;
+        return hz;
+    }
+    if (!IsWindows98()) {
+        int hz = DefaultKeyRefresh();
+        if (hz > 1) return hz < 50 ? RATE_INTERLACED : hz;
+    }
+    const AdapterRecord* a = CurrentAdapter();
+    int hz = ModeKeyRefresh(a->width, a->height, a->bits_per_pixel, 0, 0);
+    return hz < 2 ? 0 : hz;
+}
+
+int SavedRefreshRate()
+{
+    const AdapterRecord* a = CurrentAdapter();
+    if (a->refresh_hz != 0) return a->refresh_hz;
+    int32_t saved = LoadSetting(SETTING_REFRESH);
+    if (saved > 0) {
+        if (LoadSetting(SETTING_BITS) == a->bits_per_pixel && LoadSetting(SETTING_WIDTH) == a->width &&
+            LoadSetting(SETTING_HEIGHT) == a->height)
+            return saved;
+        // The saved rate belonged to another mode.
+        SaveSetting(SETTING_REFRESH, 0);
+    }
+    return OsRefreshRate();
+}
+
+int MeasuredRefreshRate()
+{
+    if (CurrentAdapter()->flags & (ADAPTER_NO_ADJUST | ADAPTER_NO_CLOCK_REFRESH)) {
+        int hz = OsRefreshRate();
+        return hz <= 0 ? RATE_FALLBACK : NearestListedRefresh(hz);
+    }
+    if (chip_is_interlaced()) return RATE_INTERLACED;
+    if (!chip_open_io()) return 0;
+    uint32_t h = chip_get_htotal();
+    uint32_t v = chip_get_vtotal();
+    uint32_t c = chip_get_char_width();
+    double pixel_clock = chip_get_pixel_clock();
+    chip_close_io();
+    uint32_t clocks_per_frame = c * v * h;
+    if (!clocks_per_frame) return 0;
+    return NearestListedRefresh((int)trunc(pixel_clock / clocks_per_frame));
+}
+
+void FreeModeTable()
+{
+    free(mode_table);
+    mode_table = NULL;
+}
+
+struct TableBuild {
+    int include_15bit;
+    int count;
+};
+
+static bool CollectMode(const ListedMode* m, void* data)
+{
+    TableBuild* b = (TableBuild*)data;
+    if (b->count == MODE_TABLE_SIZE) return false;
+    if (m->bits_per_pixel < 8 || (m->bits_per_pixel == 15 && !b->include_15bit)) return true;
+    if (m->width < 640 || m->height < 480) return true;
+    for (int i = b->count - 1; i >= 0; --i) {
+        const ModeEntry* e = &mode_table[i];
+        if (e->width == m->width && e->height == m->height && e->bits_per_pixel == m->bits_per_pixel) return true;
+    }
+    ModeEntry* e = &mode_table[b->count++];
+    e->width = m->width;
+    e->height = m->height;
+    e->bits_per_pixel = m->bits_per_pixel;
+    return b->count < MODE_TABLE_SIZE;
+}
+
+static bool ComesBefore(const ModeEntry* b, const ModeEntry* a)
+{
+    return b->width < a->width || (b->width == a->width && b->height < a->height);
+}
+
+static void SortModeTable(int count)
+{
+    for (uint16_t depth : table_depths) {
+        for (int i = 0; i < count; ++i) {
+            if (mode_table[i].bits_per_pixel != depth) continue;
+            for (int j = i + 1; j < count; ++j) {
+                if (mode_table[j].bits_per_pixel != depth || !ComesBefore(&mode_table[j], &mode_table[i])) continue;
+                ModeEntry t = mode_table[i];
+                mode_table[i] = mode_table[j];
+                mode_table[j] = t;
+            }
+        }
+    }
+}
+
+int BuildModeTable(int include_15bit)
+{
+    FreeModeTable();
+    mode_table = (ModeEntry*)calloc(MODE_TABLE_SIZE, sizeof(ModeEntry));
+    if (!mode_table) return 1;
+    TableBuild build = {include_15bit, 0};
+    ForEachListedMode(CollectMode, &build);
+    SortModeTable(build.count);
+    for (int i = 0; i < build.count; ++i) {
+        ModeEntry* e = &mode_table[i];
+        for (int k = 0; k < MODE_RATES; ++k) {
+            int rate = RefreshRateAt(k, e->width, e->height, e->bits_per_pixel);
+            if (rate <= 0) break;
+            InsertRate(e->rates, MODE_RATES, (uint16_t)rate);
+        }
+    }
+    return 1;
+}

@@ -1,0 +1,47 @@
+#include <stdlib.h>
+#include <string.h>
+
+#include "modes/mode_list.h"
+
+int ParseRateList(const char* text, int index)
+{
+    if (!text || !text[0]) return 0;
+    const char* item = text;
+    if (index == RATE_LAST) {
+        const char* comma = strrchr(text, ',');
+        if (comma) item = comma + 1;
+        return atoi(item);
+    }
+    if (index < 0) return 0;
+    for (int k = 0; k < index; ++k) {
+        item = strchr(item, ',');
+        if (!item) return 0;
+        ++item;
+    }
+    return atoi(item);
+}
+
+int CountRateListItems(const char* text)
+{
+    if (!text || !text[0]) return 0;
+    int n = 1;
+    for (const char* p = text; *p; ++p)
+        if (*p == ',') ++n;
+    return n;
+}
+
+void InsertRate(uint16_t* rates, int slots, uint16_t rate)
+{
+    int count = 0;
+    while (count < slots && rates[count]) ++count;
+    for (int i = 0; i < count; ++i) {
+        if (rates[i] == rate) return;
+        if (rates[i] > rate) {
+            if (count == slots) --count;  // the largest falls off a full list
+            memmove(&rates[i + 1], &rates[i], (size_t)(count - i) * sizeof *rates);
+            rates[i] = rate;
+            return;
+        }
+    }
+    if (count < slots) rates[count] = rate;
+}
