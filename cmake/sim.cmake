@@ -63,7 +63,7 @@ function(vistrel_test folder)
   target_link_libraries(${target} PRIVATE vistrel_test_support gtest_main)
   target_link_options(${target} PRIVATE ${VISTREL_STATIC_RUNTIME})
   set_target_properties(${target} PROPERTIES RUNTIME_OUTPUT_DIRECTORY ${TEST_DIR})
-  add_dependencies(${target} HookKeep)
+  add_dependencies(${target} HookKeep vistrel-sim simstate)
 endfunction()
 
 # vistrel_add_test(<name> <folder> [WINDOWS <v>] [FILTER <gtest filter>] [TIMEOUT <s>])

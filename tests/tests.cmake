@@ -1,3 +1,10 @@
 # Test executables (one per folder) and the runs CTest makes of them.
 vistrel_test(shell)
-vistrel_add_test(shell shell)
+vistrel_add_test(shell shell FILTER -DetectSystem.*)
+foreach(version 95 98 NT4 modern)
+  vistrel_add_test(shell-detect-${version} shell WINDOWS ${version} FILTER DetectSystem.*)
+  set_property(TEST shell-detect-${version} APPEND PROPERTY ENVIRONMENT VISTREL_EXPECT_WINDOWS=${version})
+endforeach()
+
+# The product's files load on Windows 95, 98 and NT 4.0.
+add_test(NAME product-pe COMMAND ${VISTREL_ROOT}/tools/check-product-pe ${VISTREL_ROOT}/build/product)
