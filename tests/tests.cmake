@@ -8,3 +8,8 @@ endforeach()
 
 # The product's files load on Windows 95, 98 and NT 4.0.
 add_test(NAME product-pe COMMAND ${VISTREL_ROOT}/tools/check-product-pe ${VISTREL_ROOT}/build/product)
+
+vistrel_test(chips)
+vistrel_add_test(chips chips)
+vistrel_test(modes)
+vistrel_add_test(modes modes)
