@@ -13,3 +13,7 @@ vistrel_test(chips)
 vistrel_add_test(chips chips)
 vistrel_test(modes)
 vistrel_add_test(modes modes)
+
+# vistrel-sim.exe as a process of its own, seen from outside.
+vistrel_test(system)
+vistrel_add_test(system system TIMEOUT 600)
