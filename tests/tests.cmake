@@ -17,3 +17,6 @@ vistrel_add_test(modes modes)
 # vistrel-sim.exe as a process of its own, seen from outside.
 vistrel_test(system)
 vistrel_add_test(system system TIMEOUT 600)
+
+vistrel_test(hardware)
+vistrel_add_test(hardware hardware)
