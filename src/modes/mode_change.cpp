@@ -21,7 +21,7 @@ enum { TITLE_SIZE = 40, MESSAGE_SIZE = 255 };
 static const DWORD interlaced_display_flag = 2;
 static const int nt_safe_rate = 60;
 
-static bool CloseEnough(int target, int current)
+bool RefreshCloseEnough(int target, int current)
 {
     int distance = abs(current - target);
     if (target > 90) return distance <= 5;
@@ -64,7 +64,7 @@ int SetRefreshRate(int target)
     if (target <= 1) return 0;
     AdapterRecord* a = CurrentAdapter();
     int current = MeasuredRefreshRate();
-    if (CloseEnough(target, current)) {
+    if (RefreshCloseEnough(target, current)) {
         a->refresh_hz = (uint16_t)target;
         return 1;
     }
