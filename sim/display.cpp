@@ -2,6 +2,7 @@
 // offers, mode changes that program the card's CRT timing and pixel clock
 // like a 9x display driver or an NT miniport, and Wine's desktop kept at
 // the primary card's mode. Display devices and monitors are in monitors.cpp.
+#include <math.h>
 #include <stdio.h>
 #include <stdlib.h>
 #include <string.h>
@@ -359,8 +360,10 @@ LONG MachineChangeDisplaySettings(DEVMODEA* mode, DWORD flags)
     return DISP_CHANGE_SUCCESSFUL;
 }
 
-// GetDeviceCaps(VREFRESH): what the card's registers give, rounded; an NT
-// miniport reports 1 for the hardware default it was asked for.
+// GetDeviceCaps(VREFRESH): what the card's registers give, named by the
+// rate of the driver's list it lies within 1 Hz of (a VESA 72 Hz timing runs
+// at 72.8 Hz), else rounded; an NT miniport reports 1 for the hardware
+// default it was asked for.
 int MachineScreenRefresh()
 {
     if (!sim) {
@@ -374,7 +377,13 @@ int MachineScreenRefresh()
     const SimDriverMode* m = &sim->cards[card].mode;
     if (IsNt() && m->requested <= 1) return 1;
     double hz = SimRefreshHz(card);
-    return hz > 0 ? (int)(hz + 0.5) : m->refresh;
+    if (hz <= 0) return m->refresh;
+    SimModeLimits limits = DisplayCardLimits(card);
+    uint16_t rates[SIM_MAX_RATES];
+    int n = SimModeRates(&limits, m->width, m->height, m->bits, rates);
+    for (int i = 0; i < n; i++)
+        if (fabs(hz - rates[i]) < 1.0) return rates[i];
+    return (int)(hz + 0.5);
 }
 
 int MachineDeviceModeField(const char* device, int cap_index)

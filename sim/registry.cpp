@@ -77,21 +77,20 @@ bool GetDword(HKEY root, const char* path, const char* name, DWORD* out)
     return r == ERROR_SUCCESS && type == REG_DWORD;
 }
 
-void DeleteTree(HKEY root, const char* path)
+bool DeleteTree(HKEY root, const char* path)
 {
     HKEY key;
-    if (RegOpenKeyExA(root, path, 0, KEY_ALL_ACCESS, &key) != ERROR_SUCCESS) return;
+    if (RegOpenKeyExA(root, path, 0, KEY_ALL_ACCESS, &key) != ERROR_SUCCESS) return false;
     char child[256];
     for (;;) {
         DWORD size = sizeof child;
         if (RegEnumKeyExA(key, 0, child, &size, NULL, NULL, NULL, NULL) != ERROR_SUCCESS) break;
         char sub[1024];
         snprintf(sub, sizeof sub, "%s\\%s", path, child);
-        DeleteTree(root, sub);
-        if (RegDeleteKeyA(key, child) != ERROR_SUCCESS) break;
+        if (!DeleteTree(root, sub)) break;
     }
     RegCloseKey(key);
-    RegDeleteKeyA(root, path);
+    return RegDeleteKeyA(root, path) == ERROR_SUCCESS;
 }
 
 // The keys this boot seeds, as "HKLM\path" lines.
@@ -439,15 +438,35 @@ void ServiceKey(int card, char* out, size_t size)
     snprintf(out, size, "System\\CurrentControlSet\\Services\\%s", ServiceName(card));
 }
 
+// Wine keeps HKCC\System\CurrentControlSet volatile, so the HKCC copy is
+// written volatile and made again from the HKLM copy at each start of
+// Windows.
 void WriteDefaultSettings(HKEY root, const char* key, const SimDriverMode* mode)
 {
-    SetDword(root, key, "DefaultSettings.BitsPerPel", mode->bits);
-    SetDword(root, key, "DefaultSettings.XResolution", mode->width);
-    SetDword(root, key, "DefaultSettings.YResolution", mode->height);
-    SetDword(root, key, "DefaultSettings.VRefresh", mode->requested);
-    SetDword(root, key, "DefaultSettings.Flags", mode->interlaced ? DM_INTERLACED : 0);
-    SetDword(root, key, "DefaultSettings.XPanning", 0);
-    SetDword(root, key, "DefaultSettings.YPanning", 0);
+    bool v = root == HKEY_CURRENT_CONFIG;
+    SetDword(root, key, "DefaultSettings.BitsPerPel", mode->bits, v);
+    SetDword(root, key, "DefaultSettings.XResolution", mode->width, v);
+    SetDword(root, key, "DefaultSettings.YResolution", mode->height, v);
+    SetDword(root, key, "DefaultSettings.VRefresh", mode->requested, v);
+    SetDword(root, key, "DefaultSettings.Flags", mode->interlaced ? DM_INTERLACED : 0, v);
+    SetDword(root, key, "DefaultSettings.XPanning", 0, v);
+    SetDword(root, key, "DefaultSettings.YPanning", 0, v);
+}
+
+bool ReadDefaultSettings(HKEY root, const char* key, SimDriverMode* mode)
+{
+    DWORD b, x, y, v = 0, flags = 0;
+    if (!GetDword(root, key, "DefaultSettings.BitsPerPel", &b) || !GetDword(root, key, "DefaultSettings.XResolution", &x) ||
+        !GetDword(root, key, "DefaultSettings.YResolution", &y))
+        return false;
+    GetDword(root, key, "DefaultSettings.VRefresh", &v);
+    GetDword(root, key, "DefaultSettings.Flags", &flags);
+    mode->width = (uint16_t)x;
+    mode->height = (uint16_t)y;
+    mode->bits = (uint16_t)b;
+    mode->requested = (uint16_t)v;
+    mode->interlaced = (flags & DM_INTERLACED) ? 1 : 0;
+    return true;
 }
 
 void WriteDeviceValues(int card, const char* key)
@@ -528,6 +547,11 @@ void SeedVolatileNt()
                         SimCardChip(card)->bars[0].size};
     SetValue(HKEY_LOCAL_MACHINE, path, "\\Device\\Video0.Raw", 8, list, sizeof list, true);
     SetValue(HKEY_LOCAL_MACHINE, path, "\\Device\\Video0.Translated", 8, list, sizeof list, true);
+    char device[240];
+    ServiceKey(card, path, sizeof path);
+    snprintf(device, sizeof device, "%s\\Device0", path);
+    SimDriverMode mode;
+    if (ReadDefaultSettings(HKEY_LOCAL_MACHINE, device, &mode)) WriteDefaultSettings(HKEY_CURRENT_CONFIG, device, &mode);
     MirrorIntoWineDeviceKey();
 }
 
@@ -626,17 +650,7 @@ int RegistryReadDisplaySettings(SimDriverMode* mode)
     char service[200], device[240];
     ServiceKey(card, service, sizeof service);
     snprintf(device, sizeof device, "%s\\Device0", service);
-    DWORD b, x, y, v = 0;
-    if (!GetDword(HKEY_CURRENT_CONFIG, device, "DefaultSettings.BitsPerPel", &b) ||
-        !GetDword(HKEY_CURRENT_CONFIG, device, "DefaultSettings.XResolution", &x) ||
-        !GetDword(HKEY_CURRENT_CONFIG, device, "DefaultSettings.YResolution", &y))
-        return 0;
-    GetDword(HKEY_CURRENT_CONFIG, device, "DefaultSettings.VRefresh", &v);
-    mode->width = (uint16_t)x;
-    mode->height = (uint16_t)y;
-    mode->bits = (uint16_t)b;
-    mode->requested = (uint16_t)v;
-    return 1;
+    return ReadDefaultSettings(HKEY_LOCAL_MACHINE, device, mode);
 }
 
 void RegistrySeedMachine()
