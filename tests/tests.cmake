@@ -20,3 +20,7 @@ vistrel_add_test(system system TIMEOUT 600)
 
 vistrel_test(hardware)
 vistrel_add_test(hardware hardware)
+
+# The simulated machine's own devices.
+vistrel_test(sim)
+vistrel_add_test(sim sim)
