@@ -1,5 +1,7 @@
 #include <gtest/gtest.h>
 
+#include <math.h>
+
 #include "hardware/adapters.h"
 #include "hardware/companions.h"
 #include "hardware/detect.h"

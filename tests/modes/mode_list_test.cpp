@@ -2,6 +2,7 @@
 
 #include "hardware/adapters.h"
 #include "hardware/detect.h"
+#include "hardware/machine.h"
 #include "modes/display_settings.h"
 #include "modes/mode_list.h"
 #include "shell/globals.h"
