@@ -9,6 +9,7 @@
 
 BOOL(WINAPI* restart_windows)(UINT flags, DWORD reason) = ExitWindowsEx;
 DWORD gate_reply_timeout = GATE_REPLY_TIMEOUT_MS;
+DWORD power_minute_length = KEEP_REAL_MINUTE;
 
 static const char gate_program[] = "gatectl.exe";
 enum { GATE_COMMAND_SIZE = 64 };
@@ -62,7 +63,7 @@ int StartPowerTimers(HWND main_window, int on)
         {SETTING_SUSPEND, KEEP_STATE_SUSPEND},
         {SETTING_SHUTOFF, KEEP_STATE_OFF},
     };
-    SetKeepHook(main_window, KEEP_STATE_STANDBY, 1, KEEP_REAL_MINUTE);
+    SetKeepHook(main_window, KEEP_STATE_STANDBY, 1, power_minute_length);
     for (const auto& timer : timers) {
         int32_t minutes = LoadSetting(timer.setting);
         if (minutes > 0) SetKeepHook(main_window, timer.state, 1, (DWORD)minutes);

@@ -26,6 +26,9 @@ int StartPowerTimers(HWND main_window, int on);
 extern BOOL(WINAPI* restart_windows)(UINT flags, DWORD reason);
 // The companion's answer wait; tests shorten it.
 extern DWORD gate_reply_timeout;
+// The timer minute StartPowerTimers gives the hook library, in 1/65536 of a
+// real minute; tests shorten it.
+extern DWORD power_minute_length;
 // Forgets the kept memory size.
 void ForgetGateMemorySize();
 
