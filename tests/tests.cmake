@@ -16,6 +16,7 @@ foreach(helper fake_gatectl input_window)
 endforeach()
 add_dependencies(test-companions gatectl)
 vistrel_add_test(companions companions)
+vistrel_add_test(companions-95 companions WINDOWS 95 FILTER RestartWindows.*:GateCompanion.Restart*)
 # Global hooks hear every process of the Wine session: no other test may
 # type or move the mouse meanwhile.
-set_tests_properties(companions PROPERTIES RUN_SERIAL TRUE)
+set_tests_properties(companions companions-95 PROPERTIES RUN_SERIAL TRUE)
