@@ -17,7 +17,8 @@ enum { TIMER_COUNT = 3 };
 static const DWORD timer_state[TIMER_COUNT] = {KEEP_STATE_STANDBY, KEEP_STATE_SUSPEND, KEEP_STATE_OFF};
 
 // Windows without hooks in them (console windows, MS-DOS boxes) still move
-// the cursor; the watcher looks at it this often.
+// the cursor; the watcher looks at it this often while a timer runs or the
+// monitor sleeps.
 enum { CURSOR_POLL_MS = 1000 };
 
 // Seen by every process the hooks are loaded into. Written by the hooks of
@@ -61,16 +62,18 @@ static bool CursorMoved(POINT at)
     return true;
 }
 
+// HC_NOREMOVE comes each time a program only peeks at the same message; a
+// program that does so in a loop would keep the monitor awake for ever.
 static LRESULT CALLBACK KeyboardHook(int code, WPARAM wparam, LPARAM lparam)
 {
-    if (code >= 0) NoteInput();
+    if (code == HC_ACTION) NoteInput();
     // Windows 9x needs the real hook handle here, hence the shared copy.
     return CallNextHookEx(shared.keyboard_hook, code, wparam, lparam);
 }
 
 static LRESULT CALLBACK MouseHook(int code, WPARAM wparam, LPARAM lparam)
 {
-    if (code >= 0) {
+    if (code == HC_ACTION) {
         const MOUSEHOOKSTRUCT* mouse = (const MOUSEHOOKSTRUCT*)lparam;
         bool move = wparam == WM_MOUSEMOVE || wparam == WM_NCMOUSEMOVE;
         if (!move || CursorMoved(mouse->pt)) NoteInput();
@@ -139,10 +142,14 @@ static DWORD CheckTimers()
         if (next < 0) break;
         EnterState(timer_state[next], last);
     }
+    bool pending = false;
     DWORD wait = CURSOR_POLL_MS;
-    for (int i = 0; i < TIMER_COUNT; ++i)
-        if (TimerPending(i) && TimerDeadline(i) - idle < wait) wait = TimerDeadline(i) - idle;
-    return wait;
+    for (int i = 0; i < TIMER_COUNT; ++i) {
+        if (!TimerPending(i)) continue;
+        pending = true;
+        if (TimerDeadline(i) - idle < wait) wait = TimerDeadline(i) - idle;
+    }
+    return pending || shared.asleep ? wait : INFINITE;
 }
 
 static DWORD WINAPI WatchThread(void*)

@@ -61,13 +61,6 @@ TEST_F(HookKeep, IdleEntersEachArmedStateOnceInTheOrderTheyRunOut)
     EXPECT_TRUE(CollectPowerPosts(window, 1, 10 * UNIT_MS).empty());
 }
 
-TEST_F(HookKeep, ArmingCallsWithTheWindowWorkLikeThoseWithout)
-{
-    Start();
-    SetKeepHook(window, KEEP_STATE_SUSPEND, 1, 2);
-    EXPECT_EQ((std::vector<int>{2}), States(CollectPowerPosts(window, 2, 10 * UNIT_MS)));
-}
-
 TEST_F(HookKeep, LighterStateRunningOutAfterADeeperOneIsLeftOut)
 {
     Start();
@@ -85,16 +78,6 @@ TEST_F(HookKeep, DisarmedTimerStaysQuiet)
     EXPECT_EQ((std::vector<int>{2}), States(CollectPowerPosts(window, 2, 15 * UNIT_MS)));
 }
 
-TEST_F(HookKeep, RearmedTimerTakesItsNewLength)
-{
-    Start();
-    SetKeepHook(NULL, KEEP_STATE_OFF, 1, 2);
-    SetKeepHook(NULL, KEEP_STATE_OFF, 1, 12);
-    std::vector<PowerPost> posts = CollectPowerPosts(window, 1, LATE_MS);
-    ASSERT_EQ((std::vector<int>{4}), States(posts));
-    EXPECT_GE(posts[0].at - start, 12u * UNIT_MS);
-}
-
 TEST_F(HookKeep, InputBeforeAnyStateOnlyRestartsTheIdleTime)
 {
     Start();
@@ -108,13 +91,7 @@ TEST_F(HookKeep, InputBeforeAnyStateOnlyRestartsTheIdleTime)
     EXPECT_GE(posts[0].at - pressed, 10u * UNIT_MS);
 }
 
-TEST_F(HookKeep, EnteringNowPostsBeforeTheCallReturns)
-{
-    Start();
-    EXPECT_EQ(1u, SetKeepHook(NULL, KEEP_STATE_SUSPEND, 1, 0));
-    EXPECT_TRUE(PostedAtOnce(KEEP_STATE_SUSPEND));
-}
-
+// The immediate entry posts before the call returns.
 TEST_F(HookKeep, KeyPressWakesOnceFromAStateEnteredNow)
 {
     Start();
@@ -161,33 +138,6 @@ TEST_F(HookKeep, EnteringNowTurnsTheTimersOff)
     PressShift();
     // A new idle period, in which the standby timer would have run out.
     EXPECT_EQ((std::vector<int>{0}), States(CollectPowerPosts(window, 2, 15 * UNIT_MS)));
-}
-
-TEST_F(HookKeep, StopCallEndsEverything)
-{
-    Start();
-    SetKeepHook(NULL, KEEP_STATE_STANDBY, 1, 3);
-    EXPECT_EQ(1u, SetKeepHook(NULL, KEEP_STATE_ALL, 0, 0));
-    EXPECT_TRUE(CollectPowerPosts(window, 1, 10 * UNIT_MS).empty());
-    EXPECT_EQ(0u, SetKeepHook(NULL, KEEP_STATE_OFF, 1, 0));
-    EXPECT_EQ(0u, SetKeepHook(NULL, KEEP_STATE_OFF, 1, 1));
-    EXPECT_TRUE(CollectPowerPosts(window, 1, 5 * UNIT_MS).empty());
-}
-
-TEST_F(HookKeep, StartCallForAnotherWindowTakesOver)
-{
-    Start();
-    HWND second = CreateWindowExA(0, "STATIC", "second", 0, 0, 0, 10, 10, NULL, NULL, NULL, NULL);
-    ASSERT_TRUE(second != NULL);
-    SetKeepHook(NULL, KEEP_STATE_STANDBY, 1, 2);
-    SetKeepHook(second, KEEP_STATE_STANDBY, 1, MinuteLengthFor(UNIT_MS));
-    SetKeepHook(NULL, KEEP_STATE_OFF, 1, 0);
-    MSG message;
-    EXPECT_TRUE(PeekMessageA(&message, second, MSG_POWER_STATE, MSG_POWER_STATE, PM_REMOVE));
-    EXPECT_EQ(KEEP_STATE_OFF, (int)message.wParam);
-    // The old registration's timer went with it.
-    EXPECT_TRUE(CollectPowerPosts(window, 1, 10 * UNIT_MS).empty());
-    DestroyWindow(second);
 }
 
 // Input that never reaches this process: the key goes to a window of
