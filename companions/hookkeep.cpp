@@ -40,6 +40,7 @@ static CRITICAL_SECTION watch_lock;
 static HANDLE watch_thread;
 static HANDLE watch_wake;
 static bool watch_stopping;
+static bool hooks_set;  // the shared hook handles are ours, not a dead process's
 static DWORD minute_ms;
 static DWORD timer_minutes[TIMER_COUNT];
 static DWORD period_start;  // last_input at the start of the idle period being timed
@@ -182,8 +183,11 @@ static void StopWatching()
     }
     if (watch_wake) CloseHandle(watch_wake);
     watch_wake = NULL;
-    if (shared.keyboard_hook) UnhookWindowsHookEx(shared.keyboard_hook);
-    if (shared.mouse_hook) UnhookWindowsHookEx(shared.mouse_hook);
+    if (hooks_set) {
+        if (shared.keyboard_hook) UnhookWindowsHookEx(shared.keyboard_hook);
+        if (shared.mouse_hook) UnhookWindowsHookEx(shared.mouse_hook);
+    }
+    hooks_set = false;
     shared.keyboard_hook = NULL;
     shared.mouse_hook = NULL;
     shared.window = NULL;
@@ -209,6 +213,7 @@ static DWORD StartWatching(HWND window, DWORD minute_length)
     // Without hooks (refused by the system) the cursor poll still works.
     shared.keyboard_hook = SetWindowsHookExA(WH_KEYBOARD, KeyboardHook, library_instance, 0);
     shared.mouse_hook = SetWindowsHookExA(WH_MOUSE, MouseHook, library_instance, 0);
+    hooks_set = true;
 
     watch_stopping = false;
     watch_wake = CreateEventA(NULL, FALSE, FALSE, NULL);
