@@ -13,7 +13,7 @@ set_target_properties(HookKeep gatectl PROPERTIES RUNTIME_OUTPUT_DIRECTORY ${SIM
 
 # The program without its process entry, shared by vistrel-sim.exe and the tests.
 add_library(vistrel_core STATIC ${VISTREL_PROGRAM_SOURCES})
-target_include_directories(vistrel_core PUBLIC ${VISTREL_ROOT}/src ${VISTREL_ROOT}/resources)
+target_include_directories(vistrel_core PUBLIC ${VISTREL_ROOT}/src ${VISTREL_ROOT}/resources ${VISTREL_ROOT}/companions)
 target_compile_options(vistrel_core PRIVATE ${VISTREL_PROGRAM_FLAGS})
 target_link_libraries(vistrel_core PUBLIC HookKeep ${VISTREL_SYSTEM_LIBS})
 

@@ -24,3 +24,22 @@ vistrel_add_test(hardware hardware)
 # The simulated machine's own devices.
 vistrel_test(sim)
 vistrel_add_test(sim sim)
+
+# The companions: gatectl.exe's work is linked in and driven in-process; two
+# helper programs stand in for gatectl.exe and for another process's window.
+vistrel_test(companions)
+target_sources(test-companions PRIVATE ${VISTREL_ROOT}/companions/gate.cpp)
+target_compile_definitions(test-companions PRIVATE VISTREL_SIM_DIR="${SIM_DIR}")
+foreach(helper fake_gatectl input_window)
+  string(REPLACE "_" "-" helper_name ${helper})
+  add_executable(${helper_name} WIN32 ${VISTREL_ROOT}/tests/companions/helpers/${helper}.cpp)
+  target_link_options(${helper_name} PRIVATE ${VISTREL_STATIC_RUNTIME})
+  set_target_properties(${helper_name} PROPERTIES RUNTIME_OUTPUT_DIRECTORY ${TEST_DIR})
+  add_dependencies(test-companions ${helper_name})
+endforeach()
+add_dependencies(test-companions gatectl)
+vistrel_add_test(companions companions)
+vistrel_add_test(companions-95 companions WINDOWS 95 FILTER RestartWindows.*:GateCompanion.Restart*)
+# Global hooks hear every process of the Wine session: no other test may
+# type or move the mouse meanwhile.
+set_tests_properties(companions companions-95 PROPERTIES RUN_SERIAL TRUE)
