@@ -27,22 +27,23 @@ TEST(InsertRate, AscendingWithoutRepeats)
     EXPECT_EQ((std::vector<uint16_t>{56, 60, 72, 75, 85}), std::vector<uint16_t>(rates, rates + 5));
 }
 
-// Rate lists from the chip file alone: no display driver key on this machine.
+// Rate lists from the chip file alone: no machine has a card with this id,
+// so there is no display driver key to list rates.
 class ChipListedRates : public ::testing::Test {
 protected:
     void SetUp() override
     {
         folder = MakeScratchFolder("rates");
         WriteTextFile(folder + "ZNTR3.INI",
-                      "[CHIP8901_95]\r\n640x480x8=60,72,75\r\n800x600x16=60,75\r\n1024x768x8=59,60,72\r\n"
-                      "[CHIP8901_95E]\r\n800x600x16=85,100\r\n");
+                      "[CHIP7777_95]\r\n640x480x8=60,72,75\r\n800x600x16=60,75\r\n1024x768x8=59,60,72\r\n"
+                      "[CHIP7777_95E]\r\n800x600x16=85,100\r\n");
         ResetProgramState("", folder + "ZNTR3.INI");
         platform = PLATFORM_9X;
         os_class = OS_CLASS_WIN98;
         adapter_count = 1;
         AdapterRecord* a = &adapter_table[0];
         a->vendor_id = 0x5333;
-        a->device_id = 0x8901;
+        a->device_id = 0x7777;
         a->chip_row = 15;
         SetMode(640, 480, 8);
     }
