@@ -679,14 +679,16 @@ int RegistryIsOurs(int* volatile_ours, int* volatile_missing)
     return GetText(HKEY_LOCAL_MACHINE, marker_key, "Machine", text, sizeof text) && strcmp(text, sim->identity) == 0;
 }
 
-void RegistryStartWatcher()
+void RegistryAttachProcess()
 {
-    if (watcher_thread || !IsNt()) return;
+    if (!IsNt()) return;
+    MirrorIntoWineDeviceKey();
+    if (watcher_thread) return;
     watcher_stop = CreateEventA(NULL, TRUE, FALSE, NULL);
     watcher_thread = CreateThread(NULL, 0, WatchWine, NULL, 0, NULL);
 }
 
-void RegistryStopWatcher()
+void RegistryDetachProcess()
 {
     if (!watcher_thread) return;
     SetEvent(watcher_stop);
