@@ -78,7 +78,7 @@ const SimChip chips[] = {
 // Any other card: a plain VGA with a frame buffer and nothing the program knows.
 const SimChip unknown_chip = {0, 0, "VGA compatible", SIM_FAMILY_VGA, 0x00,
                               {{16 * MB, SIM_BAR_MEMORY | SIM_BAR_PREFETCH}}, -1, 0,
-                              {80000, 65000, 40000}, false, "Standard Display Adapter (VGA)", "vga.drv",
+                              {170000, 135000, 80000}, false, "Standard Display Adapter (VGA)", "vga.drv",
                               "vga", NULL};
 
 }  // namespace

@@ -14,6 +14,13 @@ namespace {
 
 bool IsNt() { return sim->config.windows == SIM_WINDOWS_NT4; }
 
+// The card of the primary display device, whatever its PCI decoding.
+int PrimaryCard()
+{
+    int card = sim->config.primary_card;
+    return SimCardValid(card) && sim->config.cards[card].vendor_id ? card : -1;
+}
+
 struct ListedMode {
     uint16_t width, height, bits, frequency;
     bool interlaced;
@@ -102,7 +109,7 @@ void FillDevMode(DEVMODEA* dm, const ListedMode* m)
 // on Windows 98 "\\.\DISPLAYn" the n-th display device. -1 for none.
 int DeviceCard(const char* device)
 {
-    if (!device || !device[0] || lstrcmpiA(device, "DISPLAY") == 0) return SimPrimaryCard() >= 0 ? sim->config.primary_card : -1;
+    if (!device || !device[0] || lstrcmpiA(device, "DISPLAY") == 0) return PrimaryCard();
     if (sim->config.windows != SIM_WINDOWS_98 || _strnicmp(device, "\\\\.\\DISPLAY", 11) != 0) return -1;
     int cards[SIM_MAX_CARDS];
     int count = DisplayDeviceCards(cards);
@@ -198,7 +205,7 @@ HWND driver_window;
 // cannot show it.
 void OnForeignDisplayChange(int width, int height, int wine_bits)
 {
-    int card = SimPrimaryCard();
+    int card = PrimaryCard();
     if (card < 0) return;
     const SimDriverMode* m = &sim->cards[card].mode;
     if (m->width == width && m->height == height && WineBits(m->bits) == wine_bits) return;
@@ -272,7 +279,7 @@ void DisplayBoot(int use_registry_mode)
 
 void DisplayEnsureWineDesktop()
 {
-    int card = SimPrimaryCard();
+    int card = PrimaryCard();
     if (card < 0) return;
     const SimDriverMode* m = &sim->cards[card].mode;
     if (m->width) ShowOnWineDesktop(m->width, m->height, m->bits, false);
@@ -329,7 +336,7 @@ LONG MachineChangeDisplaySettings(DEVMODEA* mode, DWORD flags)
 {
     sim_counters.mode_changes++;
     if (!sim) return ChangeDisplaySettingsA(mode, flags);
-    int card = SimPrimaryCard() >= 0 ? sim->config.primary_card : -1;
+    int card = PrimaryCard();
     if (card < 0) return DISP_CHANGE_FAILED;
     SimDriverMode want = sim->cards[card].mode;
     int frequency = 0;
@@ -372,7 +379,7 @@ int MachineScreenRefresh()
         ReleaseDC(NULL, dc);
         return hz;
     }
-    int card = SimPrimaryCard();
+    int card = PrimaryCard();
     if (card < 0) return 0;
     const SimDriverMode* m = &sim->cards[card].mode;
     if (IsNt() && m->requested <= 1) return 1;

@@ -183,8 +183,10 @@ void RegistrySeedVolatile();  // HKEY_DYN_DATA and HKLM\HARDWARE, at every start
 // 1 when the registry was seeded by this machine; *volatile_missing tells a
 // restarted Wine server.
 int RegistryIsOurs(int* volatile_ours, int* volatile_missing);
-void RegistryStartWatcher();
-void RegistryStopWatcher();
+// NT: keeps the device key's values in the key Wine names in the device
+// map, now and whenever Wine rewrites it (a thread of the simulation).
+void RegistryAttachProcess();
+void RegistryDetachProcess();
 int RegistryDriverKey(int card, char* out, size_t size);  // 9x class key / NT device key under HKLM
 // The "RefreshRate" text a 9x display driver reads for a mode: its MODES
 // key's, else its DEFAULT key's. 0 when neither has one.

@@ -102,6 +102,10 @@ uint8_t ChipsetRead(const ChipsetFunction* f, int offset)
         Put16(h, 0x22, (uint16_t)((bridge_memory_limit - 1) >> 16) & 0xFFF0);
         Put16(h, 0x24, (uint16_t)(bus1_memory_start >> 16));
         Put16(h, 0x26, (uint16_t)((bridge_memory_limit - 1) >> 16) & 0xFFF0);
+        // Bridge control: forward the legacy VGA ranges when the primary
+        // card sits behind the bridge.
+        int primary = sim->config.primary_card;
+        if (primary >= 0 && primary < sim->config.card_count && sim->config.cards[primary].bus == 1) h[0x3E] = 0x08;
     }
     return h[offset];
 }

@@ -101,7 +101,7 @@ bool StateValid(const SimState* s)
 
 void SimDetach()
 {
-    RegistryStopWatcher();
+    RegistryDetachProcess();
     if (mapped_state) UnmapViewOfFile(mapped_state);
     if (state_mapping) CloseHandle(state_mapping);
     if (state_file) CloseHandle(state_file);
@@ -119,7 +119,7 @@ void SimBoot(const SimMachineConfig* config)
     Boot(config, 0, identity);
     DisplayEnsureWineDesktop();
     DisplayAttachProcess();
-    RegistryStartWatcher();
+    RegistryAttachProcess();
 }
 
 int SimAttachPersistent(const char* exe_folder)
@@ -156,7 +156,7 @@ int SimAttachPersistent(const char* exe_folder)
         }
         DisplayEnsureWineDesktop();
         DisplayAttachProcess();
-        RegistryStartWatcher();
+        RegistryAttachProcess();
         up = 1;
     } else {
         SimDetach();

@@ -36,13 +36,35 @@ HKEY Create(HKEY root, const char* path, bool is_volatile = false)
     return key;
 }
 
+// Seeding writes runs of values into one key: the last key stays open
+// (per thread: the device-map watcher writes too).
+struct OpenKey {
+    HKEY root;
+    char path[400];
+    bool is_volatile;
+    HKEY key;
+};
+thread_local OpenKey open_key;
+
+void CloseOpenKey()
+{
+    if (open_key.key) RegCloseKey(open_key.key);
+    open_key.key = NULL;
+}
+
 void SetValue(HKEY root, const char* path, const char* name, DWORD type, const void* data, DWORD size,
               bool is_volatile = false)
 {
-    HKEY key = Create(root, path, is_volatile);
-    if (!key) return;
-    RegSetValueExA(key, name, 0, type, (const BYTE*)data, size);
-    RegCloseKey(key);
+    if (!open_key.key || open_key.root != root || open_key.is_volatile != is_volatile ||
+        strcmp(open_key.path, path) != 0) {
+        CloseOpenKey();
+        open_key.key = Create(root, path, is_volatile);
+        if (!open_key.key) return;
+        open_key.root = root;
+        open_key.is_volatile = is_volatile;
+        lstrcpynA(open_key.path, path, sizeof open_key.path);
+    }
+    RegSetValueExA(open_key.key, name, 0, type, (const BYTE*)data, size);
 }
 
 void SetText(HKEY root, const char* path, const char* name, const char* text, bool is_volatile = false)
@@ -79,6 +101,7 @@ bool GetDword(HKEY root, const char* path, const char* name, DWORD* out)
 
 bool DeleteTree(HKEY root, const char* path)
 {
+    CloseOpenKey();
     HKEY key;
     if (RegOpenKeyExA(root, path, 0, KEY_ALL_ACCESS, &key) != ERROR_SUCCESS) return false;
     char child[256];
@@ -525,12 +548,14 @@ void MirrorIntoWineDeviceKey()
     if (RegOpenKeyExA(HKEY_LOCAL_MACHINE, key, 0, KEY_SET_VALUE, &probe) != ERROR_SUCCESS) return;
     RegCloseKey(probe);
     WriteDeviceValues(card, key);
+    CloseOpenKey();
     char image[80];
     snprintf(image, sizeof image, "System32\\drivers\\%s.sys", ServiceName(card));
     char* last = strrchr(key, '\\');
     if (!last) return;
     *last = 0;
     SetValue(HKEY_LOCAL_MACHINE, key, "ImagePath", REG_EXPAND_SZ, image, (DWORD)strlen(image) + 1);
+    CloseOpenKey();
 }
 
 void SeedVolatileNt()
@@ -621,6 +646,7 @@ void RegistryWriteDisplaySettings(int card, const SimDriverMode* mode)
         SetText(HKEY_CURRENT_CONFIG, "Display\\Settings", "Resolution", text);
         snprintf(text, sizeof text, "%d", mode->bits);
         SetText(HKEY_CURRENT_CONFIG, "Display\\Settings", "BitsPerPixel", text);
+        CloseOpenKey();
         return;
     }
     char service[200], device[240];
@@ -628,6 +654,7 @@ void RegistryWriteDisplaySettings(int card, const SimDriverMode* mode)
     snprintf(device, sizeof device, "%s\\Device0", service);
     WriteDefaultSettings(HKEY_CURRENT_CONFIG, device, mode);
     WriteDefaultSettings(HKEY_LOCAL_MACHINE, device, mode);
+    CloseOpenKey();
 }
 
 int RegistryReadDisplaySettings(SimDriverMode* mode)
@@ -662,6 +689,7 @@ void RegistrySeedMachine()
     seeded[seeded_used] = 0;
     SetValue(HKEY_LOCAL_MACHINE, marker_key, "Seeded", REG_MULTI_SZ, seeded, (DWORD)seeded_used + 1);
     SetText(HKEY_LOCAL_MACHINE, marker_key, "Machine", sim->identity);
+    CloseOpenKey();
 }
 
 void RegistrySeedVolatile()
@@ -669,6 +697,7 @@ void RegistrySeedVolatile()
     if (IsNt()) SeedVolatileNt();
     else SeedVolatile9x();
     SetText(HKEY_LOCAL_MACHINE, session_key, "Machine", sim->identity, true);
+    CloseOpenKey();
 }
 
 int RegistryIsOurs(int* volatile_ours, int* volatile_missing)
@@ -679,14 +708,16 @@ int RegistryIsOurs(int* volatile_ours, int* volatile_missing)
     return GetText(HKEY_LOCAL_MACHINE, marker_key, "Machine", text, sizeof text) && strcmp(text, sim->identity) == 0;
 }
 
-void RegistryStartWatcher()
+void RegistryAttachProcess()
 {
-    if (watcher_thread || !IsNt()) return;
+    if (!IsNt()) return;
+    MirrorIntoWineDeviceKey();
+    if (watcher_thread) return;
     watcher_stop = CreateEventA(NULL, TRUE, FALSE, NULL);
     watcher_thread = CreateThread(NULL, 0, WatchWine, NULL, 0, NULL);
 }
 
-void RegistryStopWatcher()
+void RegistryDetachProcess()
 {
     if (!watcher_thread) return;
     SetEvent(watcher_stop);
