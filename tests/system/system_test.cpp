@@ -173,9 +173,13 @@ TEST_F(SystemTest, SetRefreshReachesAnExtendedRateThroughThePixelClock)
         Panel panel(DefaultMachine(c.windows));
         ASSERT_TRUE(panel.Start(c.version));
         ASSERT_TRUE(panel.WaitWindow());
-        int extended = ExtendedRateFor(panel, CurrentScreen(), c.section);
-        ASSERT_GT(extended, 15) << c.windows;
-        EXPECT_EQ(1, panel.Send(msg_set_refresh, extended, 0)) << c.windows;
+        Screen screen = CurrentScreen();
+        int extended = ExtendedRateFor(panel, screen, c.section);
+        ASSERT_GT(extended, 15) << c.windows << " " << screen.width << "x" << screen.height << "x" << screen.bits
+                                << " offers " << Join(QueryRates(panel, screen.width, screen.height, screen.bits));
+        EXPECT_EQ(1, panel.Send(msg_set_refresh, extended, 0))
+            << c.windows << " " << screen.width << "x" << screen.height << "x" << screen.bits << " offers "
+            << Join(QueryRates(panel, screen.width, screen.height, screen.bits));
         EXPECT_NEAR(extended, panel.StateNumber("Card0.RefreshHz"), 2.0) << c.windows;
         EXPECT_EQ(extended, (int)panel.Send(msg_get_refresh, 0, 0)) << c.windows;
         EXPECT_STREQ(std::to_string(extended).c_str(), ReadRegistryRaw(HKEY_LOCAL_MACHINE, card_key, "refresh").c_str());
