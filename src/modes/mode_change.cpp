@@ -110,6 +110,18 @@ int ProgramRefreshClock(int rate)
     return ok ? rate : 0;
 }
 
+// The rate the user chose for the mode now running, or 0.
+static int ChosenRateOfCurrentMode()
+{
+    const AdapterRecord* a = CurrentAdapter();
+    int32_t chosen = LoadSetting(SETTING_REFRESH);
+    if (chosen <= 0) return 0;
+    if (LoadSetting(SETTING_BITS) != a->bits_per_pixel || LoadSetting(SETTING_WIDTH) != a->width ||
+        LoadSetting(SETTING_HEIGHT) != a->height)
+        return 0;
+    return chosen;
+}
+
 void SyncRefreshRate(int at_startup)
 {
     AdapterRecord* a = CurrentAdapter();
@@ -122,6 +134,13 @@ void SyncRefreshRate(int at_startup)
     } else {
         a->refresh_hz = (uint16_t)OsRefreshRate();
         a->refresh_hz = (uint16_t)MeasuredRefreshRate();
+        // After another program changed and restored the display, a 9x
+        // driver runs the rate of its own list again: keep the one chosen
+        // for this mode, which the next quiet redraw brings back.
+        if (at_startup != 0) {
+            int chosen = ChosenRateOfCurrentMode();
+            if (chosen) a->refresh_hz = (uint16_t)chosen;
+        }
     }
     if (a->refresh_hz == 0) a->refresh_hz = RATE_FALLBACK;
 }
