@@ -26,7 +26,11 @@ struct ListedMode {
     bool interlaced;
     const char* driver;  // dmDeviceName
 };
-enum { MAX_LISTED = 320 };
+enum { MAX_LISTED = 2048, MAX_SYNTHETIC_MODES = 256 };
+
+// A mode list set by SimSetModeList, in place of the card's own.
+SimListedMode synthetic_modes[MAX_SYNTHETIC_MODES];
+int synthetic_count;
 
 int BaseName(const char* file, char* out, size_t size)
 {
@@ -50,10 +54,23 @@ const int depths[] = {8, 15, 16, 32};
 // entry per frequency of the card's display driver, after the modes of the
 // VGA drivers; like real miniports it repeats a frequency here and there and
 // offers the hardware default as frequency 1.
+int BuildSyntheticList(ListedMode* list, const char* driver_name)
+{
+    int count = 0;
+    for (int i = 0; i < synthetic_count; i++) {
+        const SimListedMode* m = &synthetic_modes[i];
+        if (!IsNt()) Add(list, &count, m->width, m->height, m->bits, 0, false, driver_name);
+        for (int r = 0; IsNt() && r < m->rate_count; r++)
+            Add(list, &count, m->width, m->height, m->bits, m->rates[r], false, driver_name);
+    }
+    return count;
+}
+
 int BuildModeList(int card, ListedMode* list, char* driver_name, size_t name_size)
 {
     SimModeLimits limits = DisplayCardLimits(card);
     BaseName(SimCardChip(card)->driver_file, driver_name, name_size);
+    if (synthetic_count) return BuildSyntheticList(list, driver_name);
     int count = 0;
     if (!IsNt()) {
         Add(list, &count, 640, 480, 4, 0, false, driver_name);
@@ -255,6 +272,7 @@ int DisplayDeviceCards(int* cards)
 
 void DisplayBoot(int use_registry_mode)
 {
+    synthetic_count = 0;
     const SimMachineConfig* config = &sim->config;
     for (int card = 0; card < config->card_count; card++) {
         const SimCardConfig* c = &config->cards[card];
@@ -304,6 +322,26 @@ void DisplayDetachProcess()
 {
     if (driver_window) DestroyWindow(driver_window);
     driver_window = NULL;
+}
+
+void SimSetModeList(const SimListedMode* modes, int count)
+{
+    synthetic_count = 0;
+    for (int i = 0; i < count && i < MAX_SYNTHETIC_MODES; i++) synthetic_modes[synthetic_count++] = modes[i];
+    int card = PrimaryCard();
+    if (!sim || card < 0 || IsNt()) return;
+    char driver_key[256];
+    if (!RegistryDriverKey(card, driver_key, sizeof driver_key)) return;
+    for (int i = 0; i < synthetic_count; i++) {
+        const SimListedMode* m = &synthetic_modes[i];
+        char key[320], list[81];
+        snprintf(key, sizeof key, "%s\\MODES\\%d\\%d,%d", driver_key, m->bits, m->width, m->height);
+        SimFormatRates(m->rates, m->rate_count, list, sizeof list);
+        HKEY k;
+        if (RegCreateKeyExA(HKEY_LOCAL_MACHINE, key, 0, NULL, 0, KEY_WRITE, NULL, &k, NULL) != ERROR_SUCCESS) continue;
+        RegSetValueExA(k, "", 0, REG_SZ, (const BYTE*)list, (DWORD)strlen(list) + 1);
+        RegCloseKey(k);
+    }
 }
 
 BOOL MachineEnumDisplaySettings(const char* device, DWORD mode_number, DEVMODEA* mode)

@@ -148,6 +148,19 @@ uint32_t SimCardBarAddress(int card, int bar);
 // The whole state as simstate.exe prints it.
 void SimPrintState(FILE* out);
 
+// A display driver with a mode list of its own, for the benchmark and tests
+// of long lists: until the next boot EnumDisplaySettingsA lists these modes
+// (on NT one entry per rate, on 9x one per mode, whose MODES key is written
+// with its rates) instead of the card's. In this process only; count 0 goes
+// back to the card's own list.
+enum { SIM_LISTED_RATES = 16 };
+struct SimListedMode {
+    uint16_t width, height, bits;
+    int rate_count;
+    uint16_t rates[SIM_LISTED_RATES];
+};
+void SimSetModeList(const SimListedMode* modes, int count);
+
 // Counters of what crossed the seam, for tests and the benchmark.
 struct SimCounters {
     uint32_t port_reads, port_writes;

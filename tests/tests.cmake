@@ -43,3 +43,7 @@ vistrel_add_test(companions-95 companions WINDOWS 95 FILTER RestartWindows.*:Gat
 # Global hooks hear every process of the Wine session: no other test may
 # type or move the mouse meanwhile.
 set_tests_properties(companions companions-95 PROPERTIES RUN_SERIAL TRUE)
+
+# The benchmark runs, and on NT builds the table from one walk of the list.
+add_test(NAME bench-modetable COMMAND ${VISTREL_WINE_RUN} ${SIM_DIR}/bench-modetable.exe)
+set_tests_properties(bench-modetable PROPERTIES PASS_REGULAR_EXPRESSION "platform=NT modes=100 walks=1 ")

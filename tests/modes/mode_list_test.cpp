@@ -151,3 +151,30 @@ TEST(ModeList, NTTellsFifteenBitsFromSixteen)
     platform = PLATFORM_9X;
     EXPECT_EQ(16, TrueBitsPerPixel(16));
 }
+
+TEST(ModeList, AHundredModesFillTheTableAndEndTheEnumeration)
+{
+    Boot(SIM_WINDOWS_98);
+    static SimListedMode modes[120];
+    for (int i = 0; i < 120; ++i) {
+        modes[i] = SimListedMode();
+        modes[i].width = (uint16_t)(640 + 8 * i);
+        modes[i].height = 480;
+        modes[i].bits = 8;
+        modes[i].rate_count = 1;
+        modes[i].rates[0] = 60;
+    }
+    modes[119].width = 600;  // would sort first, were it taken
+    SimSetModeList(modes, 120);
+    ForgetDisplaySettings();
+    BuildModeTable(0);
+    int entries = 0;
+    while (entries < MODE_TABLE_SIZE && mode_table[entries].bits_per_pixel) ++entries;
+    EXPECT_EQ(MODE_TABLE_SIZE, entries);
+    EXPECT_EQ(640, mode_table[0].width);
+    EXPECT_EQ(640 + 8 * 99, mode_table[99].width);
+    EXPECT_EQ(60, mode_table[0].rates[0]);
+    EXPECT_EQ(60, mode_table[99].rates[0]);
+    FreeModeTable();
+    SimSetModeList(NULL, 0);
+}
