@@ -161,8 +161,11 @@ static void TieToDisplayDevices(EnumDisplayDevicesA_fn enum_devices)
             char description[DESCRIPTION_SIZE + 1];
             memset(description, 0, sizeof description);
             if (DriverKeyValue("", "DriverDesc", description, DESCRIPTION_SIZE, REG_SZ, 1) != 1) description[0] = 0;
+            // Windows 98 names the device with the whole description: compare
+            // as much of both as a record keeps.
             description[DEVICE_NAME_SIZE - 1] = 0;
-            if (strcmp(description, device.DeviceString) == 0) {
+            if (strncmp(description, device.DeviceString, DEVICE_NAME_SIZE - 1) == 0 &&
+                (strlen(description) < DEVICE_NAME_SIZE - 1 || strlen(device.DeviceString) >= DEVICE_NAME_SIZE - 1)) {
                 AdapterRecord* a = CurrentAdapter();
                 lstrcpynA(a->device_name, device.DeviceName, DEVICE_NAME_SIZE);
                 a->display_index = (uint16_t)n;

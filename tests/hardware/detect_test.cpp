@@ -145,6 +145,18 @@ TEST(Detection, DifferentCardsOnWindows98AreSortedByDisplayDevice)
     EXPECT_GT(adapter_table[1].width, 0);
 }
 
+TEST(Detection, LongDriverDescriptionsStillFindTheirDisplayDevice)
+{
+    SimCardConfig first = Card(0x5333, 0x8901, 1, 0);
+    SimCardConfig second = Card(0x5333, 0x8a01, 0, 9);
+    lstrcpynA(second.driver_desc, "S3 Inc. ViRGE/DX/GX PCI Accelerator (Display Driver)", SIM_DESCRIPTION_SIZE);
+    BootMachine(Machine(SIM_WINDOWS_98, {first, second}));
+    ASSERT_EQ(1, DetectAdapters());
+    ASSERT_EQ(2, adapter_count);
+    EXPECT_EQ(0x8a01, adapter_table[1].device_id);
+    EXPECT_EQ(1, adapter_table[1].display_index);
+}
+
 TEST(Detection, Windows98DropsCardsItDoesNotRun)
 {
     SimCardConfig broken = Card(0x5333, 0x8a01, 0, 9);
