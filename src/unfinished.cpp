@@ -1,15 +1,8 @@
 // Operations whose modules are still being written. Each answers "nothing
 // done" so that the program runs; none pretends to work.
-#include "adjust/adjust_window.h"
-#include "adjust/position.h"
 #include "hardware/companions.h"
 #include "modes/font_size.h"
 
-int RestorePosition() { return 1; }
-LRESULT CALLBACK AdjustWindowProc(HWND window, UINT message, WPARAM wparam, LPARAM lparam)
-{
-    return DefWindowProcA(window, message, wparam, lparam);
-}
 void SwitchFontSize(int dpi_x, int dpi_y) {}
 int GateRestart() { return 0; }
 uint32_t GateMemorySize() { return 0; }
