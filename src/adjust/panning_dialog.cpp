@@ -118,7 +118,7 @@ static void CentreOnScreen(HWND dialog)
     GetWindowRect(dialog, &r);
     int width = r.right - r.left, height = r.bottom - r.top;
     SetWindowPos(dialog, NULL, (GetSystemMetrics(SM_CXSCREEN) - width) / 2,
-                 (GetSystemMetrics(SM_CYSCREEN) - height) / 2, 0, 0, SWP_NOSIZE | SWP_NOZORDER);
+                 (GetSystemMetrics(SM_CYSCREEN) - height) / 2, 0, 0, SWP_NOSIZE | SWP_NOZORDER | SWP_NOACTIVATE);
 }
 
 static void PlacePad(HWND dialog)

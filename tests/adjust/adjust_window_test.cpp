@@ -36,6 +36,25 @@ BOOL CALLBACK ReadBoxChild(HWND child, LPARAM)
     return TRUE;
 }
 
+HWND answerer;
+const UINT MSG_ANSWER = WM_APP + 3;
+
+// Runs in the message box's own loop once the box is up and has its focus.
+LRESULT CALLBACK AnswererProc(HWND window, UINT message, WPARAM wparam, LPARAM lparam)
+{
+    if (message != MSG_ANSWER) return DefWindowProcA(window, message, wparam, lparam);
+    HWND box = (HWND)lparam;
+    GetWindowTextA(box, seen.caption, sizeof seen.caption);
+    seen.text[0] = 0;
+    EnumChildWindows(box, ReadBoxChild, 0);
+    for (int id : {IDYES, IDNO})
+        if ((GetWindowLongA(GetDlgItem(box, id), GWL_STYLE) & BS_TYPEMASK) == BS_DEFPUSHBUTTON) seen.default_button = id;
+    seen.has_yes_no = GetDlgItem(box, IDYES) && GetDlgItem(box, IDNO);
+    seen.has_ok_cancel = GetDlgItem(box, IDOK) || GetDlgItem(box, IDCANCEL);
+    PostMessageA(box, WM_COMMAND, MAKEWPARAM(seen.answer, BN_CLICKED), (LPARAM)GetDlgItem(box, seen.answer));
+    return 0;
+}
+
 LRESULT CALLBACK PressAnswer(int code, WPARAM wparam, LPARAM lparam)
 {
     HWND box = (HWND)wparam;
@@ -44,14 +63,7 @@ LRESULT CALLBACK PressAnswer(int code, WPARAM wparam, LPARAM lparam)
     if (strcmp(cls, "#32770") == 0 && box != seen.last) {
         seen.last = box;
         ++seen.count;
-        GetWindowTextA(box, seen.caption, sizeof seen.caption);
-        seen.text[0] = 0;
-        EnumChildWindows(box, ReadBoxChild, 0);
-        LRESULT def = SendMessageA(box, DM_GETDEFID, 0, 0);
-        seen.default_button = HIWORD(def) == DC_HASDEFID ? LOWORD(def) : 0;
-        seen.has_yes_no = GetDlgItem(box, IDYES) && GetDlgItem(box, IDNO);
-        seen.has_ok_cancel = GetDlgItem(box, IDOK) || GetDlgItem(box, IDCANCEL);
-        PostMessageA(box, WM_COMMAND, MAKEWPARAM(seen.answer, BN_CLICKED), (LPARAM)GetDlgItem(box, seen.answer));
+        PostMessageA(answerer, MSG_ANSWER, 0, (LPARAM)box);
     }
     return CallNextHookEx(cbt_hook, code, wparam, lparam);
 }
@@ -63,12 +75,20 @@ protected:
         AdjustTest::SetUp();
         memset(&seen, 0, sizeof seen);
         seen.answer = IDNO;
+        WNDCLASSA wc;
+        memset(&wc, 0, sizeof wc);
+        wc.lpfnWndProc = AnswererProc;
+        wc.hInstance = GetModuleHandleA(NULL);
+        wc.lpszClassName = "AdjustTestAnswerer";
+        RegisterClassA(&wc);
+        answerer = CreateWindowA(wc.lpszClassName, "", 0, 0, 0, 0, 0, HWND_MESSAGE, NULL, wc.hInstance, NULL);
         cbt_hook = SetWindowsHookExA(WH_CBT, PressAnswer, NULL, GetCurrentThreadId());
     }
     void TearDown() override
     {
         if (HWND left = FindWindowA(adjust_window_class, NULL)) DestroyWindow(left);
         UnhookWindowsHookEx(cbt_hook);
+        DestroyWindow(answerer);
         AdjustTest::TearDown();
     }
     HWND Open()
@@ -317,7 +337,7 @@ TEST(TestPattern, NestedRectanglesSitOnTheDiagonals)
         EXPECT_NEAR(20.0 * h / w, y1, 1.0);
         EXPECT_NEAR(40.0 * h / w, y3, 1.0);
         // A column clear of the diagonals and ellipses.
-        const int x = w / 2 + w / 8;
+        const int x = w / 2 + w / 16;
         EXPECT_EQ(RGB(255, 255, 255), GetPixel(dc, x, y1)) << "top of the first rectangle";
         EXPECT_EQ(RGB(255, 255, 255), GetPixel(dc, x, y3)) << "top of the second rectangle";
         EXPECT_EQ(RGB(0, 0, 0), GetPixel(dc, x, y1 + 1));

@@ -129,6 +129,23 @@ const UINT MSG_NEXT_STEP = WM_APP + 7;
 const int settle_limit = 1000;
 int settle_rounds;
 
+HHOOK start_hook;
+
+// The dialog is shown only once its loop finds the queue empty; the script
+// starts when it is.
+LRESULT CALLBACK StartWhenShown(int code, WPARAM wparam, LPARAM lparam)
+{
+    const CWPRETSTRUCT* call = (const CWPRETSTRUCT*)lparam;
+    char title[64] = "";
+    if (code == HC_ACTION && call->message == WM_SHOWWINDOW && call->wParam)
+        GetWindowTextA(call->hwnd, title, sizeof title);
+    if (strcmp(title, dialog_title) == 0 && script_next == 0 && !settle_rounds) {
+        settle_rounds = 1;
+        PostMessageA(driver, MSG_NEXT_STEP, 0, 0);
+    }
+    return CallNextHookEx(start_hook, code, wparam, lparam);
+}
+
 LRESULT CALLBACK DriverProc(HWND window, UINT message, WPARAM wparam, LPARAM lparam)
 {
     if (message != MSG_NEXT_STEP) return DefWindowProcA(window, message, wparam, lparam);
@@ -170,8 +187,9 @@ protected:
         script_length = (int)N;
         script_next = 0;
         settle_rounds = 0;
-        PostMessageA(driver, MSG_NEXT_STEP, 0, 0);
+        start_hook = SetWindowsHookExA(WH_CALLWNDPROCRET, StartWhenShown, NULL, GetCurrentThreadId());
         int result = OpenPanningDialog(NULL, dialog_title);
+        UnhookWindowsHookEx(start_hook);
         EXPECT_EQ(script_length, script_next) << "every step ran";
         return result;
     }
