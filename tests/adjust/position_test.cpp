@@ -157,13 +157,14 @@ TEST_F(StoredPositionTest, RestoreWritesWhatIsStored)
 
 TEST_F(StoredPositionTest, RestoreWithOnlyVTouchesOnlyVerticalRegisters)
 {
-    // Retrace start 0x205 (bit 9 set, bit 8 clear) stored over a mode whose
-    // retrace has bit 8 set: the other overflow bits stay as the mode set them.
-    SaveSetting(SETTING_POSITION_V, 0x05 + 256 * 0x80);
-    SetCrtc(0x07, 0x7F);
+    // Retrace start 0x205 (bit 9 set, bit 8 clear) stored with an overflow
+    // byte whose other bits differ from the mode's: only the retrace bits
+    // are taken from it, the rest stay as the mode set them.
+    SaveSetting(SETTING_POSITION_V, 0x05 + 256 * 0x93);
+    SetCrtc(0x07, 0x64);
     EXPECT_EQ(1, RestorePosition());
     EXPECT_EQ(0x05, Crtc(0x10));
-    EXPECT_EQ((0x7F & 0x7B) | 0x80, Crtc(0x07));
+    EXPECT_EQ(0xE0, Crtc(0x07));
     EXPECT_EQ(0x84, Crtc(0x04));
     EXPECT_EQ(0x85, Crtc(0x11));
 }
