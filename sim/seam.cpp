@@ -1,55 +1,82 @@
-// The machine seam answered by the simulated machine. An empty machine for
-// now: no cards, no driver devices; the display is Wine's own.
+// The machine seam answered by the simulated machine: port instructions and
+// register-window accesses. The driver devices and the video BIOS are in
+// devices.cpp, the display driver in display.cpp.
 #include "hardware/machine.h"
-#include "sim.h"
+#include "machine_state.h"
 
-uint8_t MachineInByte(uint16_t port) { return 0xFF; }
-uint32_t MachineInDword(uint16_t port) { return 0xFFFFFFFF; }
-void MachineOutByte(uint16_t port, uint8_t value) {}
-void MachineOutDword(uint16_t port, uint32_t value) {}
-uint8_t MachineReadByte(uint32_t linear) { return 0xFF; }
-uint16_t MachineReadWord(uint32_t linear) { return 0xFFFF; }
-uint32_t MachineReadDword(uint32_t linear) { return 0xFFFFFFFF; }
-void MachineWriteByte(uint32_t linear, uint8_t value) {}
-void MachineWriteWord(uint32_t linear, uint16_t value) {}
-void MachineWriteDword(uint32_t linear, uint32_t value) {}
-int MachineVideoBios(BiosRegisters* regs) { return 0; }
+uint8_t MachineInByte(uint16_t port)
+{
+    sim_counters.port_reads++;
+    return SimPortRead(port);
+}
 
-HANDLE MachineOpenDevice(const char* name, DWORD access, DWORD share, DWORD creation, DWORD flags)
+// A 32-bit port access reaches the PCI address register whole; anywhere
+// else it is four byte accesses at consecutive ports.
+uint32_t MachineInDword(uint16_t port)
 {
-    SetLastError(ERROR_FILE_NOT_FOUND);
-    return INVALID_HANDLE_VALUE;
+    sim_counters.port_reads++;
+    if (!sim) return 0xFFFFFFFF;
+    if (port == 0xCF8 || port == 0xCFC) return PciPortReadDword(port);
+    uint32_t v = 0;
+    for (int i = 3; i >= 0; i--) v = (v << 8) | SimPortRead((uint16_t)(port + i));
+    return v;
 }
-BOOL MachineDeviceRequest(HANDLE device, DWORD code, void* in, DWORD in_size, void* out, DWORD out_size,
-                          DWORD* returned)
-{
-    SetLastError(ERROR_INVALID_HANDLE);
-    return FALSE;
-}
-BOOL MachineCloseDevice(HANDLE device) { return FALSE; }
 
-BOOL MachineEnumDisplaySettings(const char* device, DWORD mode_number, DEVMODEA* mode)
+void MachineOutByte(uint16_t port, uint8_t value)
 {
-    return EnumDisplaySettingsA(device, mode_number, mode);
+    sim_counters.port_writes++;
+    SimPortWrite(port, value);
 }
-LONG MachineChangeDisplaySettings(DEVMODEA* mode, DWORD flags) { return ChangeDisplaySettingsA(mode, flags); }
-int MachineScreenRefresh()
+
+void MachineOutDword(uint16_t port, uint32_t value)
 {
-    HDC dc = GetDC(NULL);
-    int hz = GetDeviceCaps(dc, VREFRESH);
-    ReleaseDC(NULL, dc);
-    return hz;
+    sim_counters.port_writes++;
+    if (!sim) return;
+    if (port == 0xCF8 || port == 0xCFC) {
+        PciPortWriteDword(port, value);
+        return;
+    }
+    for (int i = 0; i < 4; i++) SimPortWrite((uint16_t)(port + i), (uint8_t)(value >> (8 * i)));
 }
-int MachineDeviceModeField(const char* device, int cap_index)
+
+// Wider window accesses arrive at the chip as consecutive bytes, low first
+// (a word write to the CRT index port sets index and data).
+uint8_t MachineReadByte(uint32_t linear)
 {
-    HDC dc = CreateDCA(device, NULL, NULL, NULL);
-    if (!dc) return 0;
-    int value = GetDeviceCaps(dc, cap_index);
-    DeleteDC(dc);
-    return value;
+    sim_counters.window_reads++;
+    return SimWindowRead(linear);
 }
-int MachineFindDisplayFunctions(MachineDisplayFunctions* out)
+
+uint16_t MachineReadWord(uint32_t linear)
 {
-    ZeroMemory(out, sizeof *out);
-    return 1;
+    sim_counters.window_reads++;
+    uint8_t low = SimWindowRead(linear);
+    return (uint16_t)(low | SimWindowRead(linear + 1) << 8);
+}
+
+uint32_t MachineReadDword(uint32_t linear)
+{
+    sim_counters.window_reads++;
+    uint32_t v = 0;
+    for (int i = 0; i < 4; i++) v |= (uint32_t)SimWindowRead(linear + i) << (8 * i);
+    return v;
+}
+
+void MachineWriteByte(uint32_t linear, uint8_t value)
+{
+    sim_counters.window_writes++;
+    SimWindowWrite(linear, value);
+}
+
+void MachineWriteWord(uint32_t linear, uint16_t value)
+{
+    sim_counters.window_writes++;
+    SimWindowWrite(linear, (uint8_t)value);
+    SimWindowWrite(linear + 1, (uint8_t)(value >> 8));
+}
+
+void MachineWriteDword(uint32_t linear, uint32_t value)
+{
+    sim_counters.window_writes++;
+    for (int i = 0; i < 4; i++) SimWindowWrite(linear + i, (uint8_t)(value >> (8 * i)));
 }

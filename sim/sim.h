@@ -5,6 +5,15 @@
 //
 // This header is what tests and the simulation's own programs use to build a
 // machine and look inside it. The program itself never includes it.
+//
+// One machine is current in a process at a time: the one SimBoot built in
+// this process's memory, or the persistent one SimAttachPersistent /
+// SimOpenPersistent mapped. Every Sim* call and every seam call acts on it.
+// Without any machine the seam answers as an empty PC (ports read 0xFF, no
+// driver devices) and the display calls go to Wine.
+//
+// Card numbers (`card` below) are indices into SimMachineConfig.cards.
+// Formats of SIMMACHINE.INI and of simstate.exe's report: sim/README.md.
 #ifndef VISTREL_SIM_H
 #define VISTREL_SIM_H
 
@@ -28,6 +37,7 @@ enum SimRegisterFile {
     SIM_REG_ATTRIBUTE,  // ARxx: attribute controller, 0x3C0/0x3C1
     SIM_REG_MISC,       // MISC: miscellaneous output, written 0x3C2, read 0x3CC (index ignored)
     SIM_REG_FAMILY,     // the family's own register file, by index (later families)
+    SIM_REG_PCI,        // the PCI configuration header, by byte offset 0..255
 };
 
 struct SimInitialRegister {
@@ -49,7 +59,15 @@ struct SimCardConfig {
     uint8_t edid[128];    // the monitor's EDID base block
     char driver_desc[SIM_DESCRIPTION_SIZE];  // "" = the usual description for the chip
     int initial_register_count;
-    SimInitialRegister initial_registers[SIM_MAX_INITIAL_REGISTERS];  // applied after the card's reset values
+    // Applied after the card's reset values and after the display driver
+    // programmed the boot mode, so they are what the program finds.
+    SimInitialRegister initial_registers[SIM_MAX_INITIAL_REGISTERS];
+    // Added with the first machine (defaults in SimDefaultCard):
+    uint32_t memory_extra_kb;  // memory beyond memory_mb, in KB (multiples of 64 make sense)
+    bool attached;             // Windows 98: the display device is part of the desktop
+    // The card's own start-up mode; 0 = the machine's (secondary cards only;
+    // the primary card always runs the desktop's mode).
+    uint16_t start_width, start_height, start_bits, start_refresh;
 };
 
 struct SimMachineConfig {
@@ -77,7 +95,8 @@ int SimReadDescription(const char* path, SimMachineConfig* config);
 
 // Boots a machine held in this process's memory, as tests do: resets every
 // card, seeds the registry of that Windows, and puts the display into the
-// start-up mode.
+// start-up mode. Wine's desktop is resized only when it differs from that
+// mode. The machine replaces whatever machine was current in the process.
 void SimBoot(const SimMachineConfig* config);
 // vistrel-sim.exe's machine: the state lives in the Wine prefix, keyed by
 // the folder of the executable, and outlives the process; a description
@@ -87,20 +106,45 @@ int SimAttachPersistent(const char* exe_folder);
 // simstate.exe: looks at the persistent machine of a folder without booting
 // it. Returns 0 when that machine has never run.
 int SimOpenPersistent(const char* exe_folder);
+// Lets go of the current machine (a persistent one stays in its file, as a
+// PC stays on when a program ends). Afterwards there is no machine.
+void SimDetach();
+// Restarts Windows on the current machine without touching its hardware
+// description: the cards are reset, the volatile registry (HKEY_DYN_DATA,
+// HKLM\HARDWARE) is seeded again and the desktop comes up in the mode the
+// registry holds (which is where a Windows 95 colour-depth change waits for
+// this moment). A persistent machine also does this by itself when it finds
+// that the Wine server was restarted since the program last ran.
+void SimRestartWindows();
 
 // Looking inside.
 const SimMachineConfig* SimConfig();
+// The register files as the chip holds them, without its locks, write
+// protection or side effects (a test's back door).
 uint8_t SimReadRegister(int card, SimRegisterFile file, uint16_t index);
 void SimWriteRegister(int card, SimRegisterFile file, uint16_t index, uint8_t value);
 double SimPixelClockHz(int card);   // the DCLK synthesizer's output
 double SimMemoryClockHz(int card);  // the MCLK synthesizer's output
 int SimHTotal(int card);            // in character clocks, 0 when unknown
 int SimVTotal(int card);            // in lines, 0 when unknown
-double SimRefreshHz(int card);      // 0 when the model cannot tell
+// The vertical refresh as the program's own reading of the hardware
+// defines it (for an interlaced mode, the frame rate); 0 when the model
+// cannot tell.
+double SimRefreshHz(int card);
 enum SimDpms { SIM_DPMS_ON, SIM_DPMS_STANDBY, SIM_DPMS_SUSPEND, SIM_DPMS_OFF };
 SimDpms SimDpmsState(int card);
 // The depth the display driver last set on the card.
 int SimCardDepth(int card);
+// The mode the display driver last set on the card, and the refresh rate it
+// programmed for it (whole Hz, the nominal rate of the VESA timing).
+struct SimCardMode {
+    int width, height, bits, refresh;
+    bool interlaced;
+};
+SimCardMode SimGetCardMode(int card);
+// The base address register of a card (offset 0x10 + 4 * bar) as the
+// machine assigned it at boot, flag bits cleared.
+uint32_t SimCardBarAddress(int card, int bar);
 // The whole state as simstate.exe prints it.
 void SimPrintState(FILE* out);
 
