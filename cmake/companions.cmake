@@ -1,13 +1,20 @@
 # HookKeep.dll and gatectl.exe, built the same way for both machines.
-# SetKeepHook is stdcall and exported without decoration.
+# SetKeepHook is stdcall and exported without decoration (--kill-at).
 add_library(HookKeep SHARED ${VISTREL_ROOT}/companions/hookkeep.cpp ${VISTREL_ROOT}/companions/hookkeep.def)
 set_target_properties(HookKeep PROPERTIES PREFIX "" OUTPUT_NAME HookKeep IMPORT_PREFIX "lib" IMPORT_SUFFIX ".dll.a")
 target_compile_options(HookKeep PRIVATE ${VISTREL_PROGRAM_FLAGS})
 target_link_options(HookKeep PRIVATE -Wl,--kill-at ${VISTREL_COMPANION_LINK_FLAGS})
 target_link_libraries(HookKeep PRIVATE user32)
 target_include_directories(HookKeep PRIVATE ${VISTREL_ROOT}/companions ${VISTREL_ROOT}/src)
+if(CMAKE_SIZEOF_VOID_P EQUAL 4)
+  # ld's import library carries the killed name too, where a 32-bit caller
+  # looks for _SetKeepHook@16; dlltool -k keeps the decoration for the
+  # caller and the plain name for the loader.
+  add_custom_command(TARGET HookKeep POST_BUILD
+    COMMAND ${CMAKE_DLLTOOL} -k -d ${VISTREL_ROOT}/companions/hookkeep.def -l $<TARGET_LINKER_FILE:HookKeep>)
+endif()
 
-add_executable(gatectl WIN32 ${VISTREL_ROOT}/companions/gatectl.cpp)
+add_executable(gatectl WIN32 ${VISTREL_ROOT}/companions/gatectl.cpp ${VISTREL_ROOT}/companions/gate.cpp)
 target_compile_options(gatectl PRIVATE ${VISTREL_PROGRAM_FLAGS})
 target_link_options(gatectl PRIVATE ${VISTREL_COMPANION_LINK_FLAGS})
 target_link_libraries(gatectl PRIVATE user32 advapi32)

@@ -13,7 +13,7 @@ set_target_properties(HookKeep gatectl PROPERTIES RUNTIME_OUTPUT_DIRECTORY ${SIM
 
 # The program without its process entry, shared by vistrel-sim.exe and the tests.
 add_library(vistrel_core STATIC ${VISTREL_PROGRAM_SOURCES})
-target_include_directories(vistrel_core PUBLIC ${VISTREL_ROOT}/src ${VISTREL_ROOT}/resources)
+target_include_directories(vistrel_core PUBLIC ${VISTREL_ROOT}/src ${VISTREL_ROOT}/resources ${VISTREL_ROOT}/companions)
 target_compile_options(vistrel_core PRIVATE ${VISTREL_PROGRAM_FLAGS})
 target_link_libraries(vistrel_core PUBLIC HookKeep ${VISTREL_SYSTEM_LIBS})
 
@@ -63,7 +63,7 @@ function(vistrel_test folder)
   target_link_libraries(${target} PRIVATE vistrel_test_support gtest_main)
   target_link_options(${target} PRIVATE ${VISTREL_STATIC_RUNTIME})
   set_target_properties(${target} PROPERTIES RUNTIME_OUTPUT_DIRECTORY ${TEST_DIR})
-  add_dependencies(${target} HookKeep)
+  add_dependencies(${target} HookKeep vistrel-sim simstate)
 endfunction()
 
 # vistrel_add_test(<name> <folder> [WINDOWS <v>] [FILTER <gtest filter>] [TIMEOUT <s>])

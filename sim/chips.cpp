@@ -57,7 +57,7 @@ const SimChip chips[] = {
     {0x5333, 0x8811, "S3 Trio32/Trio64 family", SIM_FAMILY_S3, 0x54, S3_BARS(64 * MB), S3_WINDOW,
      {135000, 80000, 50000}, true, "S3 Trio64 PCI", "s3vdisp.drv", "s3vmini", &s3_trio64},
     {0x5333, 0x8901, "S3 Trio64V2", SIM_FAMILY_S3, 0x16, S3_BARS(64 * MB), S3_WINDOW,
-     {135000, 80000, 50000}, true, "S3 Trio64V2/DX PCI", "s3vdisp.drv", "s3vmini", &s3_trio64v2},
+     {135000, 80000, 95000}, true, "S3 Trio64V2/DX PCI", "s3vdisp.drv", "s3vmini", &s3_trio64v2},
     {0x104c, 0x3d07, "Texas Instruments Permedia 2", SIM_FAMILY_PERMEDIA, 0x01,
      {{128 * KB, SIM_BAR_MEMORY}, {8 * MB, SIM_BAR_MEMORY | SIM_BAR_PREFETCH},
       {8 * MB, SIM_BAR_MEMORY | SIM_BAR_PREFETCH}}, -1, 0,

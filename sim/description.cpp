@@ -209,7 +209,9 @@ void SimDefaultMachine(SimMachineConfig* config)
     config->primary_card = 0;
     config->start_width = 1024;
     config->start_height = 768;
-    config->start_bits = 16;
+    // Wine's virtual desktop shows every process but the one that changed
+    // it 32 bits per pixel; a 32-bit desktop looks the same from everywhere.
+    config->start_bits = 32;
     config->start_refresh = 75;
     config->monitors = 0;
     config->nt_device = true;

@@ -30,7 +30,7 @@ const RequestShape nt_requests[] = {
     {IOCTL_READ_PORT_DWORD, 4, 4},
     {IOCTL_WRITE_PORT_BYTE, 5, 0},
     {IOCTL_WRITE_PORT_DWORD, 8, 0},
-    {IOCTL_READ_PCI_HEADER, 4, 256},
+    {IOCTL_READ_PCI_HEADER, 4, 400},  // the interface's header buffer
 };
 const RequestShape vxd_requests[] = {
     {VXD_MAP_PHYSICAL, 4, 4},

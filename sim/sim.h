@@ -85,7 +85,7 @@ struct SimMachineConfig {
 };
 
 // One S3 Trio64V2 (5333:8901) on bus 0 device 10 with 4 MB and a 17-inch
-// monitor of 1998, on Windows 98, booting into 1024x768 at 16 bits, 75 Hz.
+// monitor of 1998, on Windows 98, booting into 1024x768 at 32 bits, 75 Hz.
 void SimDefaultMachine(SimMachineConfig* config);
 // A card with the defaults of the description file's [Card<n>] section.
 void SimDefaultCard(SimCardConfig* card, uint16_t vendor_id, uint16_t device_id);

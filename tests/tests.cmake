@@ -1,9 +1,51 @@
 # Test executables (one per folder) and the runs CTest makes of them.
 vistrel_test(shell)
-vistrel_add_test(shell shell)
+vistrel_add_test(shell shell FILTER -DetectSystem.*)
+foreach(version 95 98 NT4 modern)
+  vistrel_add_test(shell-detect-${version} shell WINDOWS ${version} FILTER DetectSystem.*)
+  set_property(TEST shell-detect-${version} APPEND PROPERTY ENVIRONMENT VISTREL_EXPECT_WINDOWS=${version})
+endforeach()
+
+# The product's files load on Windows 95, 98 and NT 4.0.
+add_test(NAME product-pe COMMAND ${VISTREL_ROOT}/tools/check-product-pe ${VISTREL_ROOT}/build/product)
+
+vistrel_test(chips)
+vistrel_add_test(chips chips)
+vistrel_test(modes)
+vistrel_add_test(modes modes)
+
+# vistrel-sim.exe as a process of its own, seen from outside.
+vistrel_test(system)
+vistrel_add_test(system system TIMEOUT 600)
+
+vistrel_test(hardware)
+vistrel_add_test(hardware hardware)
+
+# The simulated machine's own devices.
 vistrel_test(sim)
 vistrel_add_test(sim sim)
+
+# The companions: gatectl.exe's work is linked in and driven in-process; two
+# helper programs stand in for gatectl.exe and for another process's window.
+vistrel_test(companions)
+target_sources(test-companions PRIVATE ${VISTREL_ROOT}/companions/gate.cpp)
+target_compile_definitions(test-companions PRIVATE VISTREL_SIM_DIR="${SIM_DIR}")
+foreach(helper fake_gatectl input_window)
+  string(REPLACE "_" "-" helper_name ${helper})
+  add_executable(${helper_name} WIN32 ${VISTREL_ROOT}/tests/companions/helpers/${helper}.cpp)
+  target_link_options(${helper_name} PRIVATE ${VISTREL_STATIC_RUNTIME})
+  set_target_properties(${helper_name} PROPERTIES RUNTIME_OUTPUT_DIRECTORY ${TEST_DIR})
+  add_dependencies(test-companions ${helper_name})
+endforeach()
+add_dependencies(test-companions gatectl)
+vistrel_add_test(companions companions)
+vistrel_add_test(companions-95 companions WINDOWS 95 FILTER RestartWindows.*:GateCompanion.Restart*)
+# Global hooks hear every process of the Wine session: no other test may
+# type or move the mouse meanwhile.
+set_tests_properties(companions companions-95 PROPERTIES RUN_SERIAL TRUE)
+
+# The adjustment window and the panning dialog; the dialog's template and
+# pictures are resources of the program.
 vistrel_test(adjust)
-# The panning dialog's template and pictures are resources of the program.
 target_sources(test-adjust PRIVATE ${VISTREL_ROOT}/resources/vistrel.rc)
 vistrel_add_test(adjust adjust)

@@ -21,7 +21,7 @@ enum { TITLE_SIZE = 40, MESSAGE_SIZE = 255 };
 static const DWORD interlaced_display_flag = 2;
 static const int nt_safe_rate = 60;
 
-static bool CloseEnough(int target, int current)
+bool RefreshCloseEnough(int target, int current)
 {
     int distance = abs(current - target);
     if (target > 90) return distance <= 5;
@@ -64,7 +64,7 @@ int SetRefreshRate(int target)
     if (target <= 1) return 0;
     AdapterRecord* a = CurrentAdapter();
     int current = MeasuredRefreshRate();
-    if (CloseEnough(target, current)) {
+    if (RefreshCloseEnough(target, current)) {
         a->refresh_hz = (uint16_t)target;
         return 1;
     }
@@ -110,6 +110,18 @@ int ProgramRefreshClock(int rate)
     return ok ? rate : 0;
 }
 
+// The rate the user chose for the mode now running, or 0.
+static int ChosenRateOfCurrentMode()
+{
+    const AdapterRecord* a = CurrentAdapter();
+    int32_t chosen = LoadSetting(SETTING_REFRESH);
+    if (chosen <= 0) return 0;
+    if (LoadSetting(SETTING_BITS) != a->bits_per_pixel || LoadSetting(SETTING_WIDTH) != a->width ||
+        LoadSetting(SETTING_HEIGHT) != a->height)
+        return 0;
+    return chosen;
+}
+
 void SyncRefreshRate(int at_startup)
 {
     AdapterRecord* a = CurrentAdapter();
@@ -122,6 +134,13 @@ void SyncRefreshRate(int at_startup)
     } else {
         a->refresh_hz = (uint16_t)OsRefreshRate();
         a->refresh_hz = (uint16_t)MeasuredRefreshRate();
+        // After another program changed and restored the display, a 9x
+        // driver runs the rate of its own list again: keep the one chosen
+        // for this mode, which the next quiet redraw brings back.
+        if (at_startup != 0) {
+            int chosen = ChosenRateOfCurrentMode();
+            if (chosen) a->refresh_hz = (uint16_t)chosen;
+        }
     }
     if (a->refresh_hz == 0) a->refresh_hz = RATE_FALLBACK;
 }

@@ -3,6 +3,7 @@
 #include "adjust/position.h"
 #include "chips/chips.h"
 #include "hardware/adapters.h"
+#include "hardware/companions.h"
 #include "hardware/detect.h"
 #include "modes/mode_change.h"
 #include "modes/mode_list.h"
@@ -28,6 +29,7 @@ static void OnCreate(HWND window)
     // picture position come back here.
     RefreshAdapterModes(REFRESH_AT_STARTUP);
     last_activity_tick = GetTickCount();
+    StartPowerTimers(window, 1);
     startup_flags &= ~STARTUP_AUTORUN;
 }
 
@@ -100,6 +102,7 @@ LRESULT CALLBACK MainWindowProc(HWND window, UINT message, WPARAM wparam, LPARAM
         OnCreate(window);
         return 0;
     case WM_DESTROY:
+        StartPowerTimers(window, 0);
         PostQuitMessage(0);
         return 0;
     case WM_PAINT:

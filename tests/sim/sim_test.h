@@ -16,6 +16,8 @@ inline SimMachineConfig MachineWith(int windows, uint16_t vendor, uint16_t devic
     SimMachineConfig config;
     SimDefaultMachine(&config);
     config.windows = windows;
+    // A 16-bit desktop exercises the clock doubling and the 4-pixel characters.
+    config.start_bits = 16;
     SimDefaultCard(&config.cards[0], vendor, device);
     config.cards[0].bus = (uint8_t)bus;
     config.cards[0].device = (uint8_t)slot;

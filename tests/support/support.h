@@ -1,3 +1,64 @@
+// Helpers shared by the test executables: a fresh program state, scratch
+// registry keys and folders, child processes, and answering message boxes.
 #ifndef VISTREL_TEST_SUPPORT_H
 #define VISTREL_TEST_SUPPORT_H
+
+#include <windows.h>
+
+#include <string>
+
+// Every global of the program as a fresh process has it, with the INI paths
+// pointing at the given files (empty: files that do not exist).
+void ResetProgramState(const std::string& text_ini = "", const std::string& chip_ini = "");
+
+// The settings store's program key, removed with everything below it.
+void ClearSettingsStore();
+void DeleteRegistryTree(HKEY root, const std::string& path);
+void WriteRegistryString(HKEY root, const std::string& path, const std::string& name, const std::string& value,
+                         bool terminated = true);
+// The raw bytes of a value; found is false when it cannot be read.
+std::string ReadRegistryRaw(HKEY root, const std::string& path, const std::string& name, bool* found = nullptr,
+                            DWORD* type = nullptr);
+bool RegistryKeyExists(HKEY root, const std::string& path);
+
+// A new empty folder below the temporary folder, as a Windows path with a
+// trailing backslash.
+std::string MakeScratchFolder(const char* prefix);
+void WriteTextFile(const std::string& path, const std::string& text);
+// A Windows path for a path of the Linux side (Wine's Z: drive).
+std::string WindowsPathOf(const std::string& unix_path);
+// build/sim as a Windows path with a trailing backslash (from VISTREL_SIM_DIR).
+std::string SimBuildFolder();
+// A private copy of build/sim's files in a new scratch folder.
+std::string CopySimBuild(const char* prefix);
+
+struct ChildProcess {
+    PROCESS_INFORMATION info = {};
+    bool Start(const std::string& command_line, const std::string& folder = "");
+    // The exit code, or -1 when the process is still running after ms.
+    long WaitExit(DWORD ms);
+    void Kill();
+    ~ChildProcess();
+};
+
+// Makes Wine report this Windows version ("win95", "win98", "nt40") to every
+// process started from that executable name.
+void SetWineVersionFor(const std::string& exe_name, const std::string& version);
+
+// Presses a button of the next message box or dialog that this thread shows,
+// and remembers its text. Works from inside the box's own message loop.
+class DialogAnswerer {
+public:
+    explicit DialogAnswerer(int button);
+    ~DialogAnswerer();
+    int answered = 0;
+    std::string text;
+    std::string caption;
+    int button;
+};
+
+// Pumps this thread's messages until the condition holds or ms pass.
+bool PumpUntil(bool (*condition)(void*), void* data, DWORD ms);
+void PumpMessages();
+
 #endif

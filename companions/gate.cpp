@@ -1,0 +1,120 @@
+#include "gate.h"
+
+#include <ddraw.h>
+#include <string.h>
+
+#include "shell/main_window.h"
+
+static const char* SkipBlanks(const char* s)
+{
+    while (*s == ' ' || *s == '\t') ++s;
+    return s;
+}
+
+// Length of the word at s.
+static size_t WordLength(const char* s)
+{
+    size_t n = 0;
+    while (s[n] && s[n] != ' ' && s[n] != '\t') ++n;
+    return n;
+}
+
+static bool RestIsBlank(const char* s) { return *SkipBlanks(s) == 0; }
+
+int ParseGateCommand(const char* arguments, GateRequest* request)
+{
+    request->command = GATE_NONE;
+    request->window_class[0] = 0;
+    if (!arguments) return GATE_NONE;
+    const char* s = SkipBlanks(arguments);
+    size_t n = WordLength(s);
+    if (n != 1) return GATE_NONE;
+
+    if (s[0] == '2') {
+        // Restarting is the one thing here that cannot be taken back: only
+        // the exact request does it.
+        s = SkipBlanks(s + 1);
+        n = WordLength(s);
+        if (n != 7 || _strnicmp(s, "restart", 7) != 0 || !RestIsBlank(s + n)) return GATE_NONE;
+        request->command = GATE_RESTART;
+        return GATE_RESTART;
+    }
+    if (s[0] == '3') {
+        s = SkipBlanks(s + 1);
+        size_t length = strlen(s);
+        while (length > 0 && (s[length - 1] == ' ' || s[length - 1] == '\t')) --length;
+        if (length >= 2 && s[0] == '"' && s[length - 1] == '"') {
+            ++s;
+            length -= 2;
+        }
+        if (length == 0) return GATE_NONE;
+        if (length > GATE_CLASS_SIZE - 1) length = GATE_CLASS_SIZE - 1;
+        memcpy(request->window_class, s, length);
+        request->window_class[length] = 0;
+        request->command = GATE_MEMORY;
+        return GATE_MEMORY;
+    }
+    return GATE_NONE;
+}
+
+uint32_t PackMemorySize(uint32_t bytes)
+{
+    uint32_t megabytes = bytes >> 20;
+    uint32_t kilobytes = (bytes >> 10) & 1023;
+    return (megabytes << 16) | (kilobytes / 64 * 64);
+}
+
+typedef HRESULT(WINAPI* DirectDrawCreateProc)(GUID*, IDirectDraw**, IUnknown*);
+
+uint32_t MeasureVideoMemory()
+{
+    // Windows 95 may have no DirectX at all, so ddraw.dll is not imported.
+    HMODULE ddraw = LoadLibraryA("ddraw.dll");
+    if (!ddraw) return 0;
+    uint32_t total = 0;
+    DirectDrawCreateProc create = (DirectDrawCreateProc)GetProcAddress(ddraw, "DirectDrawCreate");
+    IDirectDraw* draw = NULL;
+    if (create && SUCCEEDED(create(NULL, &draw, NULL)) && draw) {
+        // The DirectX 3 form of the capabilities is the oldest that every
+        // runtime since takes.
+        DDCAPS_DX3 caps;
+        memset(&caps, 0, sizeof caps);
+        caps.dwSize = sizeof caps;
+        if (SUCCEEDED(draw->GetCaps((DDCAPS*)&caps, NULL))) total = caps.dwVidMemTotal;
+        draw->Release();
+    }
+    FreeLibrary(ddraw);
+    return total;
+}
+
+int ReplyMemorySize(const char* window_class, uint32_t size)
+{
+    HWND window = FindWindowA(window_class, NULL);
+    if (!window) return 0;
+    // An unknown size is answered too: the caller would otherwise wait its
+    // full ten seconds for nothing.
+    return PostMessageA(window, MSG_GATE_REPLY, 0, (LPARAM)size) ? 1 : 0;
+}
+
+static void EnableShutdownPrivilege()
+{
+    HANDLE token;
+    if (!OpenProcessToken(GetCurrentProcess(), TOKEN_ADJUST_PRIVILEGES | TOKEN_QUERY, &token)) return;
+    TOKEN_PRIVILEGES privileges;
+    privileges.PrivilegeCount = 1;
+    privileges.Privileges[0].Attributes = SE_PRIVILEGE_ENABLED;
+    if (LookupPrivilegeValueA(NULL, SE_SHUTDOWN_NAME, &privileges.Privileges[0].Luid))
+        AdjustTokenPrivileges(token, FALSE, &privileges, 0, NULL, NULL);
+    CloseHandle(token);
+}
+
+int RestartWindows(BOOL(WINAPI* exit_windows)(UINT, DWORD))
+{
+    OSVERSIONINFOA version;
+    memset(&version, 0, sizeof version);
+    version.dwOSVersionInfoSize = sizeof version;
+    // NT refuses a restart from a process that has not enabled the privilege;
+    // Windows 9x has no privileges.
+    if (GetVersionExA(&version) && version.dwPlatformId == VER_PLATFORM_WIN32_NT) EnableShutdownPrivilege();
+    return exit_windows(EWX_REBOOT, 0) ? 1 : 0;
+}

@@ -1,0 +1,41 @@
+// gatectl.exe's work, apart from its process entry so that it can be driven
+// without restarting anything.
+#ifndef VISTREL_GATE_H
+#define VISTREL_GATE_H
+
+#include <windows.h>
+#include <stdint.h>
+
+enum GateCommand {
+    GATE_NONE = 0,
+    GATE_RESTART = 2,
+    GATE_MEMORY = 3,
+};
+
+enum { GATE_CLASS_SIZE = 256 };
+
+struct GateRequest {
+    int command;
+    char window_class[GATE_CLASS_SIZE];  // GATE_MEMORY: who gets the answer
+};
+
+// The arguments after the program name: "2 restart" or "3 <window class>".
+// Anything else is GATE_NONE and must not do anything.
+int ParseGateCommand(const char* arguments, GateRequest* request);
+
+// The memory-size format: whole megabytes << 16, OR the kilobytes beyond
+// them in steps of 64.
+uint32_t PackMemorySize(uint32_t bytes);
+
+// Bytes of video memory DirectDraw knows of; 0 without DirectDraw.
+uint32_t MeasureVideoMemory();
+
+// Posts the answer (message 1228, lParam = size) to the window of that
+// class. 1 when there was such a window.
+int ReplyMemorySize(const char* window_class, uint32_t size);
+
+// Restarts Windows through exit_windows (ExitWindowsEx in gatectl.exe),
+// taking the shutdown privilege first on NT. 1 when exit_windows agreed.
+int RestartWindows(BOOL(WINAPI* exit_windows)(UINT, DWORD));
+
+#endif

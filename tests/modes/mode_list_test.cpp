@@ -1,0 +1,153 @@
+#include <gtest/gtest.h>
+
+#include "hardware/adapters.h"
+#include "hardware/detect.h"
+#include "hardware/machine.h"
+#include "modes/display_settings.h"
+#include "modes/mode_list.h"
+#include "shell/globals.h"
+#include "shell/settings.h"
+#include "support/machine.h"
+#include "support/support.h"
+
+static void Boot(int windows)
+{
+    SimMachineConfig config;
+    SimDefaultMachine(&config);
+    config.windows = windows;
+    BootMachine(config);
+    ASSERT_EQ(1, DetectAdapters());
+    RefreshAdapterModes(REFRESH_AT_STARTUP);
+}
+
+static std::vector<int> Combined(int w, int h, int bits)
+{
+    std::vector<int> rates;
+    for (int i = 0; i < 40; ++i) {
+        int r = RefreshRateAt(i, w, h, bits);
+        if (r <= 0) break;
+        rates.push_back(r);
+    }
+    return rates;
+}
+
+static std::vector<int> Parse(const char* text)
+{
+    std::vector<int> rates;
+    for (int i = 0; ParseRateList(text, i) > 0; ++i) rates.push_back(ParseRateList(text, i));
+    return rates;
+}
+
+TEST(ModeList, Windows9xRatesFromTheDriversModeKeys)
+{
+    Boot(SIM_WINDOWS_98);
+    char driver_key[DRIVER_KEY_SIZE];
+    ASSERT_EQ(1, FindDriverKey(driver_key));
+    std::string modes = std::string(driver_key) + "\\MODES\\";
+    std::string list8 = ReadRegistryRaw(HKEY_LOCAL_MACHINE, modes + "8\\800,600", "").c_str();
+    ASSERT_FALSE(list8.empty());
+    EXPECT_EQ(Parse(list8.c_str()), Combined(800, 600, 8));
+    // Without a key of its own a deeper mode takes the 8-bit list.
+    DeleteRegistryTree(HKEY_LOCAL_MACHINE, modes + "16\\800,600");
+    EXPECT_EQ(Parse(list8.c_str()), Combined(800, 600, 16));
+    EXPECT_EQ(Parse(list8.c_str()).back(), MaxRefreshRate(800, 600, 16));
+}
+
+TEST(ModeList, WritingTheRateZeroStoresZero)
+{
+    Boot(SIM_WINDOWS_98);
+    EXPECT_EQ(1, ModeKeyRefresh(800, 600, 8, 1, 72));
+    EXPECT_EQ(72, ModeKeyRefresh(800, 600, 8, 0, 0));
+    EXPECT_EQ(1, ModeKeyRefresh(800, 600, 8, 1, 0));
+    EXPECT_EQ(0, ModeKeyRefresh(800, 600, 8, 0, 0));
+    EXPECT_EQ(-1, ModeKeyRefresh(1601, 1200, 8, 1, 60));  // no such mode key
+}
+
+TEST(ModeList, NTListsWithoutVgaModesAndRepeats)
+{
+    Boot(SIM_WINDOWS_NT4);
+    BuildModeTable(0);
+    ASSERT_TRUE(mode_table);
+    int entries = 0;
+    for (int i = 0; i < MODE_TABLE_SIZE && mode_table[i].bits_per_pixel; ++i, ++entries) {
+        const ModeEntry& e = mode_table[i];
+        EXPECT_GE(e.width, 640);
+        EXPECT_NE(15, e.bits_per_pixel);
+        for (int k = 1; k < MODE_RATES && e.rates[k]; ++k) EXPECT_LT(e.rates[k - 1], e.rates[k]);
+        if (i > 0 && mode_table[i - 1].bits_per_pixel == e.bits_per_pixel) {
+            EXPECT_TRUE(mode_table[i - 1].width < e.width ||
+                        (mode_table[i - 1].width == e.width && mode_table[i - 1].height < e.height));
+        }
+    }
+    EXPECT_GT(entries, 5);
+    // The display driver's own frequencies, in its order; the VGA driver's
+    // modes and "default" frequencies give none.
+    struct Collect {
+        std::vector<int> rates;
+        int vga_modes;
+    } collect = {{}, 0};
+    ForEachListedMode(
+        [](const ListedMode* m, void* data) {
+            Collect* c = (Collect*)data;
+            if (m->width != 640 || m->height != 480 || m->bits_per_pixel != 8) return true;
+            if (m->vga_device) ++c->vga_modes;
+            else if (m->frequency >= 5) c->rates.push_back(m->frequency);
+            return true;
+        },
+        &collect);
+    EXPECT_GT(collect.vga_modes, 0) << "the machine should list VGA modes";
+    EXPECT_EQ(collect.rates, Combined(640, 480, 8));
+    FreeModeTable();
+}
+
+TEST(ModeList, MeasuredRateIsWhatTheDriverSet)
+{
+    Boot(SIM_WINDOWS_NT4);
+    struct Mode {
+        int w, h, bits, hz;
+    } modes[] = {{640, 480, 8, 60},  {640, 480, 8, 72},   {640, 480, 16, 85},  {800, 600, 8, 56},
+                 {800, 600, 16, 72}, {1024, 768, 8, 70},  {1024, 768, 16, 85}, {1280, 1024, 8, 60},
+                 {800, 600, 8, 100}, {640, 480, 8, 120}};
+    for (const Mode& m : modes) {
+        DEVMODEA request = {};
+        request.dmSize = sizeof request;
+        request.dmFields = DM_PELSWIDTH | DM_PELSHEIGHT | DM_BITSPERPEL | DM_DISPLAYFREQUENCY;
+        request.dmPelsWidth = m.w;
+        request.dmPelsHeight = m.h;
+        request.dmBitsPerPel = m.bits;
+        request.dmDisplayFrequency = m.hz;
+        if (MachineChangeDisplaySettings(&request, 0) != DISP_CHANGE_SUCCESSFUL) continue;
+        RefreshAdapterModes(REFRESH_LATER);
+        EXPECT_EQ(m.hz, MeasuredRefreshRate()) << m.w << "x" << m.h << "x" << m.bits;
+        EXPECT_EQ(m.hz, CurrentAdapter()->refresh_hz);
+        EXPECT_NEAR(m.hz, SimRefreshHz(0), 1.0);
+    }
+}
+
+TEST(ModeList, SavedRateBelongsToItsMode)
+{
+    ClearSettingsStore();
+    Boot(SIM_WINDOWS_98);
+    AdapterRecord* a = CurrentAdapter();
+    SaveSetting(SETTING_REFRESH, 85);
+    SaveSetting(SETTING_BITS, a->bits_per_pixel);
+    SaveSetting(SETTING_WIDTH, a->width);
+    SaveSetting(SETTING_HEIGHT, a->height);
+    a->refresh_hz = 0;
+    EXPECT_EQ(85, SavedRefreshRate());
+    SaveSetting(SETTING_WIDTH, a->width + 1);
+    EXPECT_EQ(OsRefreshRate(), SavedRefreshRate());
+    EXPECT_EQ(0, LoadSetting(SETTING_REFRESH));  // another mode's rate is dropped
+    a->refresh_hz = 72;
+    EXPECT_EQ(72, SavedRefreshRate());
+    ClearSettingsStore();
+}
+
+TEST(ModeList, NTTellsFifteenBitsFromSixteen)
+{
+    Boot(SIM_WINDOWS_NT4);
+    int bits = NtDefaultBits();
+    EXPECT_TRUE(bits == 8 || bits == 16 || bits == 32 || bits == 15) << bits;
+    platform = PLATFORM_9X;
+    EXPECT_EQ(16, TrueBitsPerPixel(16));
+}
