@@ -62,9 +62,8 @@ static void OnEnter(HWND window)
 {
     if (adjust_offset_h != 0 || adjust_offset_v != 0) {
         char text[QUESTION_TEXT_SIZE], caption[QUESTION_TEXT_SIZE];
-        // Not "ScreenSave": that key is the legend's one-word label, and a
-        // text file cannot give one key two translations.
-        LoadText("ScreenSaveAsk", "Do you want to save this setting ?", text, sizeof text);
+        // The legend's label shares this key; only the built-in texts differ.
+        LoadText("ScreenSave", "Do you want to save this setting ?", text, sizeof text);
         LoadText("AdjustGrp", "Screen Adjustment", caption, sizeof caption);
         question_open = true;
         int answer = MessageBoxA(window, text, caption, MB_YESNO | MB_ICONQUESTION | MB_DEFBUTTON2);

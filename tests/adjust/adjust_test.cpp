@@ -1,14 +1,17 @@
 #include "adjust/adjust_test.h"
 
-#include <stdio.h>
 #include <stdlib.h>
 #include <string.h>
+
+#include <string>
 
 #include "adjust/adjust_window.h"
 #include "adjust/position.h"
 #include "hardware/adapters.h"
 #include "shell/globals.h"
 #include "shell/startup.h"
+#include "support/machine.h"
+#include "support/support.h"
 
 static const char card_key[] = "SOFTWARE\\QUORVEL\\PANEL\\53338901";
 int beep_count;
@@ -21,35 +24,20 @@ static BOOL WINAPI CountBeep(UINT type)
 
 bool StoredValue(const char* name, int* value)
 {
-    HKEY key;
-    if (RegOpenKeyExA(HKEY_LOCAL_MACHINE, card_key, 0, KEY_READ, &key) != ERROR_SUCCESS) return false;
-    char data[16] = {0};  // stored without a terminating zero
-    DWORD size = sizeof data - 1;
-    LONG result = RegQueryValueExA(key, name, NULL, NULL, (BYTE*)data, &size);
-    RegCloseKey(key);
-    *value = atoi(data);
-    return result == ERROR_SUCCESS;
+    bool found = false;
+    *value = atoi(ReadRegistryRaw(HKEY_LOCAL_MACHINE, card_key, name, &found).c_str());
+    return found;
 }
 
 void AdjustTest::SetUp()
 {
     SimMachineConfig config;
     SimDefaultMachine(&config);
-    SimBoot(&config);
-    platform = PLATFORM_9X;
-    os_class = OS_CLASS_WIN98;
-    instance = GetModuleHandleA(NULL);
+    BootMachine(config);
     adapter_count = 1;
-    current_adapter = 0;
     monitor_count = 1;
     adapter_table[0] = AdapterRecord{0x5333, 0x8901, 0, 10 << 3, 16, 1024, 768, 75, 15, 0, 0, 0, ""};
-
-    char folder[MAX_PATH];
-    GetTempPathA(sizeof folder, folder);
-    snprintf(ini_path, sizeof ini_path, "%svistrel-adjust-%lu.ini", folder, GetCurrentProcessId());
-    DeleteFileA(ini_path);
-    snprintf(text_ini_path, sizeof text_ini_path, "%s", ini_path);
-    RegDeleteKeyA(HKEY_LOCAL_MACHINE, card_key);
+    DeleteRegistryTree(HKEY_LOCAL_MACHINE, card_key);
     ResetAdjustOffsets();
     beep_count = 0;
     adjust_beep = CountBeep;
@@ -67,18 +55,11 @@ void AdjustTest::SetUp()
 
 void AdjustTest::TearDown()
 {
-    RegDeleteKeyA(HKEY_LOCAL_MACHINE, card_key);
-    DeleteFileA(ini_path);
+    DeleteRegistryTree(HKEY_LOCAL_MACHINE, card_key);
     adjust_beep = MessageBeep;
 }
 
-void AdjustTest::UseTexts(const char* lines)
-{
-    FILE* f = fopen(ini_path, "w");
-    ASSERT_TRUE(f != NULL);
-    fprintf(f, "[TASKBAR]\n%s", lines);
-    fclose(f);
-}
+void AdjustTest::UseTexts(const char* lines) { WriteTextFile(text_ini_path, std::string("[TASKBAR]\n") + lines); }
 
 uint8_t Crtc(uint16_t index) { return SimReadRegister(0, SIM_REG_CRTC, index); }
 void SetCrtc(uint16_t index, uint8_t value) { SimWriteRegister(0, SIM_REG_CRTC, index, value); }

@@ -13,9 +13,8 @@ class AdjustTest : public ::testing::Test {
 protected:
     void SetUp() override;
     void TearDown() override;
-    // Makes a text file with these [TASKBAR] lines the program's.
+    // Writes these [TASKBAR] lines into the program's text file.
     void UseTexts(const char* lines);
-    char ini_path[MAX_PATH] = "";
 };
 
 // Horizontal blank start 0x80 and retrace start 0x84; vertical blank start

@@ -176,9 +176,10 @@ TEST_F(AdjustWindowTest, EnterAndNoKeepsOffsetsUntilDefault)
 
 TEST_F(AdjustWindowTest, TextsFromTheTextFileAreCut)
 {
-    UseTexts("ScreenSaveAsk=Soll diese Einstellung gespeichert werden? 0123456789abcdef\n"
+    // One key serves the legend's label and the question, each cut to its size.
+    UseTexts("ScreenSave=Soll diese Einstellung gespeichert werden? 0123456789abcdef\n"
              "AdjustGrp=Bildlage 0123456789012345678901234567890123456789012345678901\n"
-             "ScreenUp=Nach oben hin\nScreenSave=Speichern!\nScreenCancel=\n");
+             "ScreenUp=Nach oben hin\nScreenCancel=\n");
     HWND window = Open();
     Press(window, VK_UP);
     Press(window, VK_RETURN);
@@ -188,7 +189,7 @@ TEST_F(AdjustWindowTest, TextsFromTheTextFileAreCut)
     LegendTexts texts;
     LoadLegendTexts(&texts);
     EXPECT_STREQ("Nach oben", texts.up);
-    EXPECT_STREQ("Speichern", texts.save);
+    EXPECT_STREQ("Soll dies", texts.save);
     EXPECT_STREQ("", texts.cancel) << "an empty entry is an empty text";
     EXPECT_STREQ("Right", texts.right);
 }
