@@ -47,3 +47,9 @@ set_tests_properties(companions companions-95 PROPERTIES RUN_SERIAL TRUE)
 # The benchmark runs, and on NT builds the table from one walk of the list.
 add_test(NAME bench-modetable COMMAND ${VISTREL_WINE_RUN} ${SIM_DIR}/bench-modetable.exe)
 set_tests_properties(bench-modetable PROPERTIES PASS_REGULAR_EXPRESSION "platform=NT modes=100 walks=1 ")
+
+# The adjustment window and the panning dialog; the dialog's template and
+# pictures are resources of the program.
+vistrel_test(adjust)
+target_sources(test-adjust PRIVATE ${VISTREL_ROOT}/resources/vistrel.rc)
+vistrel_add_test(adjust adjust)
