@@ -14,7 +14,8 @@ if(CMAKE_SIZEOF_VOID_P EQUAL 4)
     COMMAND ${CMAKE_DLLTOOL} -k -d ${VISTREL_ROOT}/companions/hookkeep.def -l $<TARGET_LINKER_FILE:HookKeep>)
 endif()
 
-add_executable(gatectl WIN32 ${VISTREL_ROOT}/companions/gatectl.cpp ${VISTREL_ROOT}/companions/gate.cpp)
+add_executable(gatectl WIN32 ${VISTREL_ROOT}/companions/gatectl.cpp ${VISTREL_ROOT}/companions/gate.cpp
+               ${VISTREL_ROOT}/src/hardware/shutdown.cpp)
 target_compile_options(gatectl PRIVATE ${VISTREL_PROGRAM_FLAGS})
 target_link_options(gatectl PRIVATE ${VISTREL_COMPANION_LINK_FLAGS})
 target_link_libraries(gatectl PRIVATE user32 advapi32)

@@ -3,6 +3,7 @@
 #include <ddraw.h>
 #include <string.h>
 
+#include "hardware/shutdown.h"
 #include "shell/main_window.h"
 
 static const char* SkipBlanks(const char* s)
@@ -94,18 +95,6 @@ int ReplyMemorySize(const char* window_class, uint32_t size)
     // An unknown size is answered too: the caller would otherwise wait its
     // full ten seconds for nothing.
     return PostMessageA(window, MSG_GATE_REPLY, 0, (LPARAM)size) ? 1 : 0;
-}
-
-static void EnableShutdownPrivilege()
-{
-    HANDLE token;
-    if (!OpenProcessToken(GetCurrentProcess(), TOKEN_ADJUST_PRIVILEGES | TOKEN_QUERY, &token)) return;
-    TOKEN_PRIVILEGES privileges;
-    privileges.PrivilegeCount = 1;
-    privileges.Privileges[0].Attributes = SE_PRIVILEGE_ENABLED;
-    if (LookupPrivilegeValueA(NULL, SE_SHUTDOWN_NAME, &privileges.Privileges[0].Luid))
-        AdjustTokenPrivileges(token, FALSE, &privileges, 0, NULL, NULL);
-    CloseHandle(token);
 }
 
 int RestartWindows(BOOL(WINAPI* exit_windows)(UINT, DWORD))

@@ -10,6 +10,7 @@
 #include "hardware/driver_device.h"
 #include "hardware/machine.h"
 #include "hardware/pci.h"
+#include "hardware/registry_text.h"
 #include "modes/mode_change.h"
 #include "modes/mode_list.h"
 #include "shell/globals.h"
@@ -265,23 +266,6 @@ static void UpperCase(char* s)
     for (; *s; ++s) *s = (char)toupper((unsigned char)*s);
 }
 
-// Reads a string value into a buffer of size bytes, always terminated.
-static int ReadString(HKEY root, const char* path, const char* name, char* out, DWORD size)
-{
-    HKEY key;
-    out[0] = 0;
-    if (RegOpenKeyExA(root, path, 0, KEY_READ, &key) != ERROR_SUCCESS) return 0;
-    DWORD length = size - 1;
-    LONG r = RegQueryValueExA(key, name, NULL, NULL, (BYTE*)out, &length);
-    RegCloseKey(key);
-    if (r != ERROR_SUCCESS) {
-        out[0] = 0;
-        return 0;
-    }
-    out[length < size ? length : size - 1] = 0;
-    return 1;
-}
-
 // The Config Manager node of the current adapter: its key name below
 // "Config Manager\Enum" and its hardware key.
 static int FindDeviceNode(char* node, DWORD node_size, char* hardware_key, DWORD key_size)
@@ -300,7 +284,7 @@ static int FindDeviceNode(char* node, DWORD node_size, char* hardware_key, DWORD
         LONG r = RegEnumKeyExA(nodes, i, node, &length, NULL, NULL, NULL, NULL);
         if (r == ERROR_MORE_DATA) continue;  // a name too long to be ours
         if (r != ERROR_SUCCESS) break;
-        if (!ReadString(nodes, node, "HardWareKey", hardware_key, key_size)) continue;
+        if (!ReadRegistryText(nodes, node, "HardWareKey", hardware_key, key_size)) continue;
         UpperCase(hardware_key);
         if (!strstr(hardware_key, pci)) continue;
         if ((a->flags & ADAPTER_TWIN) && !strstr(hardware_key, location)) continue;
@@ -315,7 +299,7 @@ int FindDriverKey(char* out)
     out[0] = 0;
     if (platform == PLATFORM_NT) {
         char path[DRIVER_KEY_SIZE];
-        if (!ReadString(HKEY_LOCAL_MACHINE, nt_video_map, nt_video0_value, path, sizeof path)) return -1;
+        if (!ReadRegistryText(HKEY_LOCAL_MACHINE, nt_video_map, nt_video0_value, path, sizeof path)) return -1;
         // "\Registry\Machine\System\..." -> "System\..."
         const char* rest = path + 1;
         for (int i = 0; i < 2 && rest; ++i) {
@@ -330,7 +314,7 @@ int FindDriverKey(char* out)
     if (!FindDeviceNode(node, sizeof node, hardware_key, sizeof hardware_key)) return -1;
     char enum_path[HARDWARE_KEY_SIZE + 8], driver[HARDWARE_KEY_SIZE];
     snprintf(enum_path, sizeof enum_path, "Enum\\%s", hardware_key);
-    if (!ReadString(HKEY_LOCAL_MACHINE, enum_path, "Driver", driver, sizeof driver) || !driver[0]) return -1;
+    if (!ReadRegistryText(HKEY_LOCAL_MACHINE, enum_path, "Driver", driver, sizeof driver) || !driver[0]) return -1;
     snprintf(out, DRIVER_KEY_SIZE, "%s%s", class_key_prefix, driver);
     return 1;
 }

@@ -6,6 +6,7 @@
 
 #include "hardware/adapters.h"
 #include "hardware/detect.h"
+#include "hardware/registry_text.h"
 #include "modes/mode_list.h"
 #include "shell/globals.h"
 
@@ -14,23 +15,6 @@ static const char nt_resource_map[] = "hardware\\resourcemap\\video";
 static const char nt_primary_raw[] = "\\Device\\Video0.Raw";
 static const char nt_services[] = "System\\CurrentControlSet\\Services\\";
 static const char nt_bits_value[] = "DefaultSettings.BitsPerPel";
-
-// Reads a text value of at most size - 1 bytes; 1 when present.
-static int ReadText(HKEY root, const char* path, const char* name, char* out, DWORD size)
-{
-    out[0] = 0;
-    HKEY key;
-    if (RegOpenKeyExA(root, path, 0, KEY_READ, &key) != ERROR_SUCCESS) return 0;
-    DWORD length = size - 1;
-    LONG r = RegQueryValueExA(key, name, NULL, NULL, (BYTE*)out, &length);
-    RegCloseKey(key);
-    if (r != ERROR_SUCCESS) {
-        out[0] = 0;
-        return 0;
-    }
-    out[length] = 0;
-    return 1;
-}
 
 int DriverKeyValue(const char* subkey, const char* name, void* buffer, uint32_t size, uint32_t type, int read)
 {
@@ -98,7 +82,7 @@ int DefaultKeyRefresh()
     memset(text, 0, sizeof text);
     if (DriverKeyValue("\\DEFAULT", "RefreshRate", text, VALUE_TEXT_SIZE, REG_SZ, 1) == 1 && text[0] && atoi(text) > 0)
         return atoi(text);
-    if (!ReadText(HKEY_CURRENT_CONFIG, "Display\\Settings", "RefreshRate", text, sizeof text)) return -1;
+    if (!ReadRegistryText(HKEY_CURRENT_CONFIG, "Display\\Settings", "RefreshRate", text, sizeof text)) return -1;
     return atoi(text);
 }
 
@@ -111,10 +95,10 @@ int DriverImageName(char* out)
     if (platform == PLATFORM_NT) {
         char* last = strrchr(path, '\\');
         if (last) *last = 0;
-        ok = ReadText(HKEY_LOCAL_MACHINE, path, "imagepath", out, VALUE_TEXT_SIZE);
+        ok = ReadRegistryText(HKEY_LOCAL_MACHINE, path, "imagepath", out, VALUE_TEXT_SIZE);
     } else {
         strcat(path, "\\DEFAULT");
-        ok = ReadText(HKEY_LOCAL_MACHINE, path, "drv", out, VALUE_TEXT_SIZE);
+        ok = ReadRegistryText(HKEY_LOCAL_MACHINE, path, "drv", out, VALUE_TEXT_SIZE);
     }
     if (!ok) out[0] = 0;
     return ok ? 1 : -1;

@@ -9,6 +9,7 @@
 #include "hardware/adapters.h"
 #include "hardware/companions.h"
 #include "hardware/machine.h"
+#include "hardware/shutdown.h"
 #include "modes/font_size.h"
 #include "modes/mode_list.h"
 #include "shell/globals.h"
@@ -187,18 +188,6 @@ static int AskUser(HWND owner, const char* key, const char* fallback, UINT style
     LoadText("DispChgTle", "Change Display Mode", title, sizeof title);
     LoadText(key, fallback, text, sizeof text);
     return MessageBoxA(owner, text, title, style);
-}
-
-static void EnableShutdownPrivilege()
-{
-    HANDLE token;
-    if (!OpenProcessToken(GetCurrentProcess(), TOKEN_ADJUST_PRIVILEGES | TOKEN_QUERY, &token)) return;
-    TOKEN_PRIVILEGES privileges;
-    privileges.PrivilegeCount = 1;
-    privileges.Privileges[0].Attributes = SE_PRIVILEGE_ENABLED;
-    if (LookupPrivilegeValueA(NULL, "SeShutdownPrivilege", &privileges.Privileges[0].Luid))
-        AdjustTokenPrivileges(token, FALSE, &privileges, 0, NULL, NULL);
-    CloseHandle(token);
 }
 
 static int OfferRestart(HWND owner)
