@@ -4,14 +4,13 @@
 
 #include <windows.h>
 
+#include "chips/chip_io.h"
 #include "chips/chips.h"
 #include "hardware/adapters.h"
 #include "shell/settings.h"
 
 int adjust_offset_h, adjust_offset_v;
 
-static const uint16_t crtc_index_port = 0x3D4;
-static const uint16_t crtc_data_port = 0x3D5;
 
 enum : uint8_t {
     CR02_HBLANK_START = 0x02,
@@ -41,14 +40,14 @@ static const int32_t stored_v_highest = 65535;
 
 static uint8_t ReadCrtc(uint8_t index)
 {
-    chip_write_port(crtc_index_port, index);
-    return (uint8_t)chip_read_port(crtc_data_port);
+    chip_write_port(VGA_CRTC_INDEX, index);
+    return (uint8_t)chip_read_port(VGA_CRTC_DATA);
 }
 
 static void WriteCrtc(uint8_t index, uint8_t value)
 {
-    chip_write_port(crtc_index_port, index);
-    chip_write_port(crtc_data_port, value);
+    chip_write_port(VGA_CRTC_INDEX, index);
+    chip_write_port(VGA_CRTC_DATA, value);
 }
 
 // CR11 bit 7 write-protects CR00-CR07; clear it before moving the retrace.
