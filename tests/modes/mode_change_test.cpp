@@ -80,6 +80,22 @@ TEST_F(ModeChange, AnExtendedRateIsReachedThroughThePixelClock)
     }
 }
 
+TEST_F(ModeChange, AnUnclampedChipAsksWindowsForTheRateItself)
+{
+    Boot(SIM_WINDOWS_98);
+    int extended = AddExtendedRate();
+    const AdapterRecord* a = CurrentAdapter();
+    int max = MaxRefreshRate(a->width, a->height, a->bits_per_pixel);
+    ASSERT_EQ(1, SetRefreshRate(extended));
+    EXPECT_EQ(max, ModeKeyRefresh(a->width, a->height, a->bits_per_pixel, 0, 0));  // clamped to the list
+
+    Boot(SIM_WINDOWS_98);
+    CurrentAdapter()->flags |= 0x0004;
+    ASSERT_EQ(1, SetRefreshRate(extended));
+    EXPECT_EQ(extended, ModeKeyRefresh(a->width, a->height, a->bits_per_pixel, 0, 0));
+    EXPECT_NEAR(extended, SimRefreshHz(0), 2.0);
+}
+
 TEST_F(ModeChange, ARateCloseToTheRunningOneChangesNothing)
 {
     Boot(SIM_WINDOWS_98);

@@ -3,6 +3,7 @@
 #include "shell/globals.h"
 #include "shell/main_window.h"
 #include "shell/startup.h"
+#include "shell/tray.h"
 #include "support/support.h"
 
 TEST(StartupSwitch, SlashAInAnyCaseAnywhere)
@@ -171,4 +172,24 @@ TEST(SecondStart, WakesTheRunningCopyAndEnds)
     EXPECT_EQ(before.y, after.y);
     DestroyWindow(running);
     UnregisterClassA("zentra", wc.hInstance);
+}
+
+TEST(MainWindowSpot, TheCornerAtTheFarEndOfTheTaskbar)
+{
+    TaskbarPlace place = {1024, 768, {0, 740, 1024, 768}};  // along the bottom
+    POINT p = MainWindowSpot(&place);
+    EXPECT_EQ(1023, p.x);
+    EXPECT_EQ(767, p.y);
+    place.taskbar = {994, 0, 1024, 768};  // at the right
+    p = MainWindowSpot(&place);
+    EXPECT_EQ(1023, p.x);
+    EXPECT_EQ(767, p.y);
+    place.taskbar = {0, 0, 30, 768};  // at the left: bottom-left pixel
+    p = MainWindowSpot(&place);
+    EXPECT_EQ(0, p.x);
+    EXPECT_EQ(767, p.y);
+    place.taskbar = {0, 0, 1024, 28};  // across the top: top-right pixel
+    p = MainWindowSpot(&place);
+    EXPECT_EQ(1023, p.x);
+    EXPECT_EQ(0, p.y);
 }
