@@ -18,7 +18,7 @@ add_executable(vistrel WIN32 ${VISTREL_PROGRAM_SOURCES}
                ${VISTREL_ROOT}/src/hardware/machine_x86.cpp ${VISTREL_ROOT}/src/shell/winmain.cpp
                ${VISTREL_ROOT}/resources/vistrel.rc)
 target_include_directories(vistrel PRIVATE ${VISTREL_ROOT}/src ${VISTREL_ROOT}/resources ${VISTREL_ROOT}/companions)
-target_compile_options(vistrel PRIVATE $<$<COMPILE_LANGUAGE:CXX>:${VISTREL_PROGRAM_FLAGS} -ffunction-sections -fdata-sections>)
+target_compile_options(vistrel PRIVATE $<$<COMPILE_LANGUAGE:CXX>:${VISTREL_PROGRAM_FLAGS} -ffunction-sections>)
 target_compile_definitions(vistrel PRIVATE VISTREL_PRODUCT=1)
 target_link_options(vistrel PRIVATE ${VISTREL_WIN4_LINK_FLAGS})
 target_link_libraries(vistrel PRIVATE HookKeep ${VISTREL_SYSTEM_LIBS})

@@ -110,19 +110,27 @@ class Canvas:
             x += len(rows[0]) * scale + gap
 
     def bmp(self):
-        """The picture as a 4-bit BI_RGB bitmap file."""
-        stride = ((self.width * 4 + 31) // 32) * 4
-        rows = []
+        """The picture as a 4-bit bitmap file, run-length encoded (BI_RLE4):
+        flat pictures shrink to a fraction, and LoadBitmap expands them."""
+        bits = bytearray()
         for y in reversed(range(self.height)):
-            line = self.pixels[y] + [0]
-            row = bytes((line[x] << 4) | line[x + 1] for x in range(0, self.width, 2))
-            rows.append(row.ljust(stride, b"\0"))
-        bits = b"".join(rows)
+            line = self.pixels[y]
+            x = 0
+            while x < self.width:
+                colour = line[x]
+                run = 1
+                while x + run < self.width and line[x + run] == colour and run < 255:
+                    run += 1
+                bits += bytes((run, (colour << 4) | colour))
+                x += run
+            bits += b"\0\0"          # end of line
+        bits += b"\0\1"              # end of bitmap
         palette = b"".join(struct.pack("<BBBB", b, g, r, 0) for r, g, b in PALETTE)
         offset = 14 + 40 + len(palette)
-        info = struct.pack("<IiiHHIIiiII", 40, self.width, self.height, 1, 4, 0, len(bits), 2835, 2835, 16, 16)
+        bi_rle4 = 2
+        info = struct.pack("<IiiHHIIiiII", 40, self.width, self.height, 1, 4, bi_rle4, len(bits), 2835, 2835, 16, 16)
         header = struct.pack("<2sIHHI", b"BM", offset + len(bits), 0, 0, offset)
-        return header + info + palette + bits
+        return header + info + palette + bytes(bits)
 
 
 def arrow_points(element):
