@@ -6,6 +6,7 @@
 
 enum {
     ADAPTER_NO_ADJUST = 0x0001,       // no picture moving and no clock-based refresh
+    ADAPTER_UNCLAMPED_RATE = 0x0004,  // Windows is asked for rates above the mode list's maximum
     ADAPTER_NO_CLOCK_REFRESH = 0x0008,  // refresh left to the display driver
     ADAPTER_TWIN = 0x0010,            // same ids as another card: match bus and device too
     ADAPTER_INFO_STALE = 0x0040,      // memory clock changed since the Information list was made

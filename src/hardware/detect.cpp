@@ -1,6 +1,7 @@
 #include "hardware/detect.h"
 
 #include <ctype.h>
+#include <stddef.h>
 #include <stdio.h>
 #include <string.h>
 #include <windows.h>
@@ -25,7 +26,10 @@ static const char nt_video_map[] = "hardware\\devicemap\\video";
 static const char nt_video0_value[] = "\\device\\video0";
 static const uint8_t nt_bus_order[] = {1, 0};
 enum { NT_SLOTS = 32, HARDWARE_KEY_SIZE = 120, NODE_KEY_SIZE = 80, DESCRIPTION_SIZE = 100 };
+// The display device structure as Windows 98 has it, without the later
+// DeviceID and DeviceKey.
 static const DWORD display_device_size = 168;
+static_assert(offsetof(DISPLAY_DEVICEA, DeviceID) == 168, "the Windows 98 display device structure");
 
 int FindChipRow(uint16_t vendor_id, uint16_t device_id, uint16_t* row)
 {

@@ -4,6 +4,8 @@
 #include "hardware/machine.h"
 #include "shell/globals.h"
 
+static_assert(sizeof(MONITORINFO) == 40, "the monitor information of Windows 98");
+
 const HMONITOR primary_monitor_stub = (HMONITOR)(uintptr_t)0x12340042;
 
 static MachineDisplayFunctions functions;

@@ -16,8 +16,8 @@
 #include "shell/settings.h"
 #include "shell/texts.h"
 
-// Capability bit: the rate asked for is not clamped to the mode list's maximum.
-enum { ADAPTER_UNCLAMPED_RATE = 0x0004 };
+static_assert(sizeof(DEVMODEA) == 156, "the mode request of the standard size, no driver bytes");
+
 enum { TITLE_SIZE = 40, MESSAGE_SIZE = 255 };
 static const DWORD interlaced_display_flag = 2;
 static const int nt_safe_rate = 60;

@@ -19,6 +19,8 @@ HWND main_window;
 const char main_window_class[] = "zentra";
 const char adjust_window_class[] = "ScreenAdjust";
 
+static_assert(sizeof(OSVERSIONINFOA) == 148, "the version structure Windows 95 knows");
+
 static const int min_bits_per_pixel = 8;
 static const DWORD nt4_build = 1381;
 static const WORD win95_osr_build = 1111;

@@ -5,6 +5,10 @@
 
 #include "shell/globals.h"
 
+#if defined(__i386__)
+static_assert(sizeof(APPBARDATA) == 36, "the taskbar query of Windows 95 and NT 4.0");
+#endif
+
 POINT MainWindowSpot(const TaskbarPlace* place)
 {
     POINT spot = {place->screen_width - 1, place->screen_height - 1};

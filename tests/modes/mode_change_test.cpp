@@ -90,7 +90,7 @@ TEST_F(ModeChange, AnUnclampedChipAsksWindowsForTheRateItself)
     EXPECT_EQ(max, ModeKeyRefresh(a->width, a->height, a->bits_per_pixel, 0, 0));  // clamped to the list
 
     Boot(SIM_WINDOWS_98);
-    CurrentAdapter()->flags |= 0x0004;
+    CurrentAdapter()->flags |= ADAPTER_UNCLAMPED_RATE;
     ASSERT_EQ(1, SetRefreshRate(extended));
     EXPECT_EQ(extended, ModeKeyRefresh(a->width, a->height, a->bits_per_pixel, 0, 0));
     EXPECT_NEAR(extended, SimRefreshHz(0), 2.0);
