@@ -5,6 +5,7 @@
 #include "hardware/adapters.h"
 #include "hardware/companions.h"
 #include "hardware/detect.h"
+#include "modes/display_settings.h"
 #include "modes/mode_change.h"
 #include "modes/mode_list.h"
 #include "shell/globals.h"
@@ -113,6 +114,7 @@ LRESULT CALLBACK MainWindowProc(HWND window, UINT message, WPARAM wparam, LPARAM
         shell_state &= ~STATE_MENU_PENDING;
         break;
     case WM_DISPLAYCHANGE:
+        ForgetDisplaySettings();
         OnDisplayChange(window);
         return 0;
     case MSG_QUERY_REFRESH:

@@ -6,6 +6,7 @@
 #include "modes/display_settings.h"
 #include "modes/mode_list.h"
 #include "shell/globals.h"
+#include "shell/main_window.h"
 #include "shell/settings.h"
 #include "support/machine.h"
 #include "support/support.h"
@@ -180,4 +181,21 @@ TEST(ModeList, AHundredModesFillTheTableAndEndTheEnumeration)
     EXPECT_EQ(60, mode_table[99].rates[0]);
     FreeModeTable();
     SimSetModeList(NULL, 0);
+}
+
+TEST(ModeList, NTListsAreWalkedOnceUntilTheDisplayChanges)
+{
+    Boot(SIM_WINDOWS_NT4);
+    ForgetDisplaySettings();
+    SimResetCounters();
+    for (int i = 0; i < 5; ++i) RefreshRateAt(i, 800, 600, 8);
+    MaxRefreshRate(1024, 768, 8);
+    EXPECT_EQ(1u, SimGetCounters()->enum_settings_walks);
+
+    HWND window = CreateWindowExA(WS_EX_TOOLWINDOW, "STATIC", "", WS_POPUP, 0, 0, 1, 1, NULL, NULL, NULL, NULL);
+    CurrentAdapter()->refresh_hz = REFRESH_CHANGE_MARKER;  // re-read nothing else
+    MainWindowProc(window, WM_DISPLAYCHANGE, 8, MAKELPARAM(1024, 768));
+    RefreshRateAt(0, 800, 600, 8);
+    EXPECT_EQ(2u, SimGetCounters()->enum_settings_walks);
+    DestroyWindow(window);
 }
