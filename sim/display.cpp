@@ -47,8 +47,6 @@ void Add(ListedMode* list, int* count, int width, int height, int bits, int freq
     list[(*count)++] = {(uint16_t)width, (uint16_t)height, (uint16_t)bits, (uint16_t)frequency, interlaced, driver};
 }
 
-const int depths[] = {8, 15, 16, 32};
-
 // What EnumDisplaySettingsA walks. Windows 9x lists each resolution and
 // depth once (frequency 0), the 16-colour VGA modes included. NT lists one
 // entry per frequency of the card's display driver, after the modes of the
@@ -81,7 +79,8 @@ int BuildModeList(int card, ListedMode* list, char* driver_name, size_t name_siz
         Add(list, &count, 640, 480, 8, 70, false, "vga256");
     }
     bool interlace_capable = SimCardChip(card)->family == SIM_FAMILY_S3;
-    for (int bits : depths) {
+    for (int d = 0; d < sim_desktop_depth_count; d++) {
+        int bits = sim_desktop_depths[d];
         for (int s = 0; s < sim_desktop_size_count; s++) {
             int w = sim_desktop_sizes[s].width, h = sim_desktop_sizes[s].height;
             uint16_t rates[SIM_MAX_RATES];
@@ -330,17 +329,9 @@ void SimSetModeList(const SimListedMode* modes, int count)
     for (int i = 0; i < count && i < MAX_SYNTHETIC_MODES; i++) synthetic_modes[synthetic_count++] = modes[i];
     int card = PrimaryCard();
     if (!sim || card < 0 || IsNt()) return;
-    char driver_key[256];
-    if (!RegistryDriverKey(card, driver_key, sizeof driver_key)) return;
     for (int i = 0; i < synthetic_count; i++) {
         const SimListedMode* m = &synthetic_modes[i];
-        char key[320], list[81];
-        snprintf(key, sizeof key, "%s\\MODES\\%d\\%d,%d", driver_key, m->bits, m->width, m->height);
-        SimFormatRates(m->rates, m->rate_count, list, sizeof list);
-        HKEY k;
-        if (RegCreateKeyExA(HKEY_LOCAL_MACHINE, key, 0, NULL, 0, KEY_WRITE, NULL, &k, NULL) != ERROR_SUCCESS) continue;
-        RegSetValueExA(k, "", 0, REG_SZ, (const BYTE*)list, (DWORD)strlen(list) + 1);
-        RegCloseKey(k);
+        RegistryWriteModeList9x(card, m->width, m->height, m->bits, m->rates, m->rate_count);
     }
 }
 

@@ -190,6 +190,7 @@ void RegistryDetachProcess();
 int RegistryDriverKey(int card, char* out, size_t size);  // 9x class key / NT device key under HKLM
 // The "RefreshRate" text a 9x display driver reads for a mode: its MODES
 // key's, else its DEFAULT key's. 0 when neither has one.
+void RegistryWriteModeList9x(int card, int width, int height, int bits, const uint16_t* rates, int count);
 int RegistryRefreshText9x(int card, int width, int height, int bits, char* out, size_t size);
 void RegistryWriteDisplaySettings(int card, const SimDriverMode* mode);  // CDS_UPDATEREGISTRY
 int RegistryReadDisplaySettings(SimDriverMode* mode);  // the mode Windows starts in; 0 = none

@@ -14,6 +14,10 @@ const SimSize sim_desktop_sizes[] = {
 };
 const int sim_desktop_size_count = sizeof sim_desktop_sizes / sizeof sim_desktop_sizes[0];
 
+// No 24-bit modes: the chips modelled run true colour in 32 bits.
+const int sim_desktop_depths[] = {8, 15, 16, 32};
+const int sim_desktop_depth_count = sizeof sim_desktop_depths / sizeof sim_desktop_depths[0];
+
 double SimTimingFrameRate(const SimTiming* timing)
 {
     return timing->pixel_khz * 1000.0 / ((double)timing->htotal * timing->vtotal);

@@ -40,6 +40,9 @@ struct SimSize {
 };
 extern const SimSize sim_desktop_sizes[];
 extern const int sim_desktop_size_count;
+// The depths the machine offers them at.
+extern const int sim_desktop_depths[];
+extern const int sim_desktop_depth_count;
 
 enum { SIM_MAX_RATES = 16 };
 // The rates (ascending, distinct, progressive only) a driver offers for a

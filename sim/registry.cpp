@@ -237,6 +237,15 @@ void ModesKey(const char* driver_key, int bits, int width, int height, char* out
     snprintf(out, size, "%s\\MODES\\%d\\%d,%d", driver_key, bits, width, height);
 }
 
+// A MODES key of a 9x display driver: the rates it offers, ascending.
+void WriteModeList(const char* driver_key, int width, int height, int bits, const uint16_t* rates, int count)
+{
+    char sub[320], list[81];
+    ModesKey(driver_key, bits, width, height, sub, sizeof sub);
+    SimFormatRates(rates, count, list, sizeof list);
+    SetText(HKEY_LOCAL_MACHINE, sub, "", list);
+}
+
 void SeedDisplayClass9x(int card)
 {
     const SimCardConfig* c = &sim->config.cards[card];
@@ -265,17 +274,15 @@ void SeedDisplayClass9x(int card)
     int start_w = own_start ? c->start_width : m->start_width, start_h = own_start ? c->start_height : m->start_height;
     int start_bits = own_start ? c->start_bits : m->start_bits;
     int start_rate = own_start ? c->start_refresh : m->start_refresh;
-    static const int depths[] = {8, 15, 16, 32};
-    for (int bits : depths) {
+    for (int d = 0; d < sim_desktop_depth_count; d++) {
+        int bits = sim_desktop_depths[d];
         for (int s = 0; s < sim_desktop_size_count; s++) {
             int w = sim_desktop_sizes[s].width, h = sim_desktop_sizes[s].height;
             uint16_t rates[SIM_MAX_RATES];
             int n = SimModeRates(&limits, w, h, bits, rates);
             if (!n) continue;
-            char list[81];
-            SimFormatRates(rates, n, list, sizeof list);
+            WriteModeList(key, w, h, bits, rates, n);
             ModesKey(key, bits, w, h, sub, sizeof sub);
-            SetText(HKEY_LOCAL_MACHINE, sub, "", list);
             if (w == start_w && h == start_h && bits == start_bits && start_rate > 1) {
                 char rate[16];
                 snprintf(rate, sizeof rate, "%d", start_rate);
@@ -625,6 +632,13 @@ int RegistryDriverKey(int card, char* out, size_t size)
     }
     DriverKey9x(card, out, size);
     return 1;
+}
+
+void RegistryWriteModeList9x(int card, int width, int height, int bits, const uint16_t* rates, int count)
+{
+    char key[256];
+    if (!RegistryDriverKey(card, key, sizeof key)) return;
+    WriteModeList(key, width, height, bits, rates, count);
 }
 
 int RegistryRefreshText9x(int card, int width, int height, int bits, char* out, size_t size)

@@ -21,17 +21,6 @@ static void Boot(int windows)
     RefreshAdapterModes(REFRESH_AT_STARTUP);
 }
 
-static std::vector<int> Combined(int w, int h, int bits)
-{
-    std::vector<int> rates;
-    for (int i = 0; i < 40; ++i) {
-        int r = RefreshRateAt(i, w, h, bits);
-        if (r <= 0) break;
-        rates.push_back(r);
-    }
-    return rates;
-}
-
 static std::vector<int> Parse(const char* text)
 {
     std::vector<int> rates;
@@ -47,10 +36,10 @@ TEST(ModeList, Windows9xRatesFromTheDriversModeKeys)
     std::string modes = std::string(driver_key) + "\\MODES\\";
     std::string list8 = ReadRegistryRaw(HKEY_LOCAL_MACHINE, modes + "8\\800,600", "").c_str();
     ASSERT_FALSE(list8.empty());
-    EXPECT_EQ(Parse(list8.c_str()), Combined(800, 600, 8));
+    EXPECT_EQ(Parse(list8.c_str()), OfferedRates(800, 600, 8));
     // Without a key of its own a deeper mode takes the 8-bit list.
     DeleteRegistryTree(HKEY_LOCAL_MACHINE, modes + "16\\800,600");
-    EXPECT_EQ(Parse(list8.c_str()), Combined(800, 600, 16));
+    EXPECT_EQ(Parse(list8.c_str()), OfferedRates(800, 600, 16));
     EXPECT_EQ(Parse(list8.c_str()).back(), MaxRefreshRate(800, 600, 16));
 }
 
@@ -97,7 +86,7 @@ TEST(ModeList, NTListsWithoutVgaModesAndRepeats)
         },
         &collect);
     EXPECT_GT(collect.vga_modes, 0) << "the machine should list VGA modes";
-    EXPECT_EQ(collect.rates, Combined(640, 480, 8));
+    EXPECT_EQ(collect.rates, OfferedRates(640, 480, 8));
     FreeModeTable();
 }
 

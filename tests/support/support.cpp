@@ -235,6 +235,17 @@ DialogAnswerer::~DialogAnswerer()
     active_answerer = nullptr;
 }
 
+std::vector<int> OfferedRates(int width, int height, int bits)
+{
+    std::vector<int> rates;
+    for (int i = 0; i < 40; ++i) {
+        int r = RefreshRateAt(i, width, height, bits);
+        if (r <= 0) break;
+        rates.push_back(r);
+    }
+    return rates;
+}
+
 void PumpMessages()
 {
     MSG msg;

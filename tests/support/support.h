@@ -6,6 +6,7 @@
 #include <windows.h>
 
 #include <string>
+#include <vector>
 
 // Every global of the program as a fresh process has it, with the INI paths
 // pointing at the given files (empty: files that do not exist).
@@ -56,6 +57,9 @@ public:
     std::string caption;
     int button;
 };
+
+// The rates RefreshRateAt offers for a mode, in order, until the list ends.
+std::vector<int> OfferedRates(int width, int height, int bits);
 
 // Pumps this thread's messages until the condition holds or ms pass.
 bool PumpUntil(bool (*condition)(void*), void* data, DWORD ms);
