@@ -80,31 +80,89 @@ static int ChipListRate(const ModeKey* mode, const char* suffix, int index, int*
     return TextRate(text, index, count);
 }
 
+// Appends the items of a comma-separated list until one is not a rate.
+// False when the list ended early at such an item.
+static bool AppendTextRates(const char* text, uint16_t* rates, int max, int* count)
+{
+    int items = CountRateListItems(text);
+    for (int k = 0; k < items; ++k) {
+        int rate = ParseRateList(text, k);
+        if (rate <= 0) return false;
+        if (*count < max) rates[(*count)++] = (uint16_t)rate;
+    }
+    return true;
+}
+
+struct NtRateCollect {
+    ModeKey mode;
+    uint16_t* rates;
+    int max;
+    int count;
+};
+
+static bool CollectNtRate(const ListedMode* m, void* data)
+{
+    NtRateCollect* c = (NtRateCollect*)data;
+    if (m->width != c->mode.width || m->height != c->mode.height || m->bits_per_pixel != c->mode.bits) return true;
+    if (m->vga_device || m->frequency < min_nt_frequency) return true;
+    if (c->count < c->max) c->rates[c->count++] = m->frequency;
+    return true;
+}
+
+static bool ReadChipList(const ModeKey* mode, const char* suffix, char* text, DWORD size)
+{
+    char section[32], key[32];
+    snprintf(section, sizeof section, platform == PLATFORM_NT ? "CHIP%04x_NT4%s" : "CHIP%04x_95%s",
+             CurrentAdapter()->device_id, suffix);
+    snprintf(key, sizeof key, "%dx%dx%d", mode->width, mode->height, mode->bits);
+    GetPrivateProfileStringA(section, key, "", text, size, chip_ini_path);
+    return text[0] != 0;
+}
+
+// The combined rate list of a mode, each source read once: the base list
+// (the system's, else the chip file's) up to its first item that is not a
+// rate, then, when the base list ran to its end, the extended list likewise.
+// This is the list RefreshRateAt walks item by item. Returns the count.
+static int ReadCombinedList(const ModeKey* mode, uint16_t* rates, int max)
+{
+    int count = 0;
+    bool complete;
+    char text[RATE_LIST_TEXT_SIZE];
+    if (platform == PLATFORM_NT) {
+        NtRateCollect c = {*mode, rates, max, 0};
+        ForEachListedMode(CollectNtRate, &c);
+        count = c.count;
+        complete = true;
+        if (!count && !ReadChipList(mode, "", text, sizeof text)) return 0;
+        if (!count) complete = AppendTextRates(text, rates, max, &count);
+    } else {
+        if (!ModeKeyRates(mode->width, mode->height, mode->bits, text, sizeof text) &&
+            !ReadChipList(mode, "", text, sizeof text))
+            return 0;
+        complete = AppendTextRates(text, rates, max, &count);
+    }
+    if (!complete || (CurrentAdapter()->flags & ADAPTER_NO_CLOCK_REFRESH)) return count;
+    if (ReadChipList(mode, "E", text, sizeof text)) AppendTextRates(text, rates, max, &count);
+    return count;
+}
+
 int RefreshRateAt(int index, int width, int height, int bits)
 {
     ModeKey mode = {width, height, bits};
-    int base_count = 0;
-    int rate = OsRate(&mode, index, &base_count);
-    if (rate > 0) return rate;
-    if (rate == NO_LIST) {
-        rate = ChipListRate(&mode, "", index, &base_count);
-        if (rate > 0) return rate;
-        if (rate == NO_LIST) return 0;
-    }
-    if (CurrentAdapter()->flags & ADAPTER_NO_CLOCK_REFRESH) return 0;
-    if (index < base_count) return 0;
-    rate = ChipListRate(&mode, "E", index - base_count, NULL);
-    return rate > 0 ? rate : 0;
+    uint16_t rates[LIST_WALK_LIMIT];
+    int count = ReadCombinedList(&mode, rates, LIST_WALK_LIMIT);
+    return index >= 0 && index < count ? rates[index] : 0;
 }
 
 int CombinedRateRange(int width, int height, int bits, int* lowest, int* highest)
 {
+    ModeKey mode = {width, height, bits};
+    uint16_t rates[LIST_WALK_LIMIT];
+    int count = ReadCombinedList(&mode, rates, LIST_WALK_LIMIT);
     *lowest = *highest = 0;
-    for (int i = 0; i < LIST_WALK_LIMIT; ++i) {
-        int rate = RefreshRateAt(i, width, height, bits);
-        if (rate <= 0) break;
-        if (!*lowest || rate < *lowest) *lowest = rate;
-        if (rate > *highest) *highest = rate;
+    for (int i = 0; i < count; ++i) {
+        if (!*lowest || rates[i] < *lowest) *lowest = rates[i];
+        if (rates[i] > *highest) *highest = rates[i];
     }
     return *highest > 0;
 }
@@ -123,10 +181,13 @@ int NearestListedRefresh(int target)
 {
     if (target <= 0) return 0;
     const AdapterRecord* a = CurrentAdapter();
+    ModeKey mode = {a->width, a->height, a->bits_per_pixel};
+    uint16_t rates[LIST_WALK_LIMIT];
+    int count = ReadCombinedList(&mode, rates, LIST_WALK_LIMIT);
     int lower = 0, upper = 0;
-    for (int i = 0; i < LIST_WALK_LIMIT; ++i) {
-        int rate = RefreshRateAt(i, a->width, a->height, a->bits_per_pixel);
-        if (rate <= 0) return lower;
+    for (int i = 0; i <= count; ++i) {
+        if (i == count) return lower;
+        int rate = rates[i];
         if (rate >= target) {
             upper = rate;
             break;
@@ -250,11 +311,10 @@ int BuildModeTable(int include_15bit)
     SortModeTable(build.count);
     for (int i = 0; i < build.count; ++i) {
         ModeEntry* e = &mode_table[i];
-        for (int k = 0; k < MODE_RATES; ++k) {
-            int rate = RefreshRateAt(k, e->width, e->height, e->bits_per_pixel);
-            if (rate <= 0) break;
-            InsertRate(e->rates, MODE_RATES, (uint16_t)rate);
-        }
+        ModeKey mode = {e->width, e->height, e->bits_per_pixel};
+        uint16_t rates[LIST_WALK_LIMIT];
+        int count = ReadCombinedList(&mode, rates, LIST_WALK_LIMIT);
+        for (int k = 0; k < count && k < MODE_RATES; ++k) InsertRate(e->rates, MODE_RATES, rates[k]);
     }
     return 1;
 }
