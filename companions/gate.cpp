@@ -3,8 +3,8 @@
 #include <ddraw.h>
 #include <string.h>
 
+#include "base/protocol.h"
 #include "hardware/shutdown.h"
-#include "shell/main_window.h"
 
 static const char* SkipBlanks(const char* s)
 {

@@ -11,7 +11,7 @@
 #define HOOKKEEP_BUILD
 #include "hookkeep.h"
 
-#include "shell/main_window.h"
+#include "base/protocol.h"
 
 enum { TIMER_COUNT = 3 };
 static const DWORD timer_state[TIMER_COUNT] = {KEEP_STATE_STANDBY, KEEP_STATE_SUSPEND, KEEP_STATE_OFF};

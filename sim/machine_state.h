@@ -6,8 +6,8 @@
 
 #include <stdint.h>
 
-#include "sim.h"
 #include "modes.h"
+#include "sim.h"
 
 // A VGA core: the register files and the latches of its index ports.
 struct SimVga {

@@ -2,7 +2,7 @@
 
 #include <string.h>
 
-#include "shell/texts.h"
+#include "base/texts.h"
 
 static const COLORREF pattern_white = RGB(255, 255, 255);
 static const COLORREF legend_text_colour = RGB(0, 255, 255);

@@ -3,11 +3,11 @@
 #include "adjust/adjust_window.h"
 
 #include "adjust/adjust_pattern.h"
-#include "adjust/position.h"
+#include "base/protocol.h"
+#include "base/state.h"
+#include "base/texts.h"
 #include "hardware/multimon.h"
-#include "shell/globals.h"
-#include "shell/startup.h"
-#include "shell/texts.h"
+#include "modes/position.h"
 
 BOOL(WINAPI* adjust_beep)(UINT type) = MessageBeep;
 

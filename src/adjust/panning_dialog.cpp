@@ -3,11 +3,11 @@
 #include <stdio.h>
 
 #include "adjust/adjust_resources.h"
-#include "adjust/position.h"
-#include "hardware/adapters.h"
-#include "modes/mode_list.h"
-#include "shell/globals.h"
-#include "shell/texts.h"
+#include "base/adapters.h"
+#include "base/state.h"
+#include "base/texts.h"
+#include "hardware/driver_key.h"
+#include "modes/position.h"
 
 static const char panning_template[] = "MOVESCREEN";
 static const COLORREF frame_fill = RGB(0, 128, 128);

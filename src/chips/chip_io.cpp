@@ -1,11 +1,11 @@
 #include "chips/chip_io.h"
 
-#include "hardware/adapters.h"
+#include "base/adapters.h"
+#include "base/state.h"
 #include "hardware/driver_device.h"
 #include "hardware/machine.h"
 #include "hardware/pci.h"
 #include "hardware/register_access.h"
-#include "shell/globals.h"
 
 // The linear address of the port in the current adapter's window, or 0 when
 // the port instructions reach it.

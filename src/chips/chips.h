@@ -41,12 +41,18 @@ enum {
     CHIP_CAP_AGP = 0x8000,
 };
 
-// Argument of CMD_PREPARE_MODE, passed by address.
+// Argument of CMD_PREPARE_MODE, passed by address. The driver answers what
+// the display driver must find before the mode change, and the mode change
+// writes it.
 struct ChipModeRecord {
     uint16_t width;
     uint16_t height;
     uint16_t bits_per_pixel;
     uint32_t refresh_hz;
+};
+
+enum {
+    PREPARE_REFRESH_KEY = 0x1,  // the 9x driver reads the rate from the mode's "RefreshRate"
 };
 
 typedef uint32_t (*ChipDispatchFn)(uint32_t command, uintptr_t argument);
@@ -73,7 +79,8 @@ uint32_t chip_get_char_width();
 uint32_t chip_write_port(uint32_t port, uint32_t value);
 uint32_t chip_read_port(uint32_t port);
 uint32_t chip_get_mem_size();
-void chip_prepare_mode(uint16_t width, uint16_t height, uint16_t bits, uint32_t refresh);
+// What the display driver must find before this mode is set (PREPARE_*).
+uint32_t chip_prepare_mode(uint16_t width, uint16_t height, uint16_t bits, uint32_t refresh);
 uint32_t chip_hide_page(uint32_t page);
 uint32_t chip_map_registers();
 uint32_t chip_get_mem_type();

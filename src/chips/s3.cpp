@@ -4,14 +4,13 @@
 #include <math.h>
 #include <string.h>
 
+#include "base/adapters.h"
+#include "base/state.h"
 #include "chips/chip_io.h"
 #include "chips/chips.h"
-#include "chips/families.h"
+#include "chips/s3.h"
 #include "chips/synth.h"
-#include "hardware/adapters.h"
 #include "hardware/register_access.h"
-#include "modes/mode_list.h"
-#include "shell/globals.h"
 
 // VGA port p lies at 0x8000 + p of the register window.
 static const ChipPortWindow s3_ports = {true, 1, 0, 0, 0x8000};
@@ -187,12 +186,8 @@ static uint32_t MemorySize()
     return mb << 16;
 }
 
-static uint32_t PrepareMode(const ChipModeRecord* mode)
-{
-    // The 9x display driver takes the refresh rate from its mode key.
-    if (platform != PLATFORM_9X) return 0;
-    return ModeKeyRefresh(mode->width, mode->height, mode->bits_per_pixel, 1, (int)mode->refresh_hz) > 0 ? 1 : 0;
-}
+// The 9x display driver takes the refresh rate from its mode key.
+static uint32_t PrepareMode() { return platform == PLATFORM_9X ? PREPARE_REFRESH_KEY : 0; }
 
 static uint32_t IsInterlaced()
 {
@@ -250,7 +245,7 @@ uint32_t S3Dispatch(uint32_t command, uintptr_t argument)
     case CMD_WRITE_PORT: return ChipOutByte(&s3_ports, (uint16_t)argument, (uint8_t)(argument >> 16));
     case CMD_READ_PORT: return ChipInByte(&s3_ports, (uint16_t)argument);
     case CMD_GET_MEM_SIZE: return MemorySize();
-    case CMD_PREPARE_MODE: return PrepareMode((const ChipModeRecord*)argument);
+    case CMD_PREPARE_MODE: return PrepareMode();
     case CMD_MAP_REGISTERS:
         return MapRegisterWindow(CurrentChip()->layout == CLOCK_SAVAGE3D ? &savage3d_window : &s3_window);
     case CMD_IS_INTERLACED: return IsInterlaced();

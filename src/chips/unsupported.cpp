@@ -1,4 +1,4 @@
-#include "chips/families.h"
+#include "chips/unsupported.h"
 
 uint32_t UnsupportedDispatch(uint32_t command, uintptr_t argument) { return 0; }
 uint32_t UnsupportedSetPixelClock(double hz) { return 0; }

@@ -2,10 +2,9 @@
 
 #include <stdio.h>
 
+#include "base/protocol.h"
+#include "base/settings.h"
 #include "hookkeep.h"
-#include "shell/main_window.h"
-#include "shell/settings.h"
-#include "shell/startup.h"
 
 BOOL(WINAPI* restart_windows)(UINT flags, DWORD reason) = ExitWindowsEx;
 DWORD gate_reply_timeout = GATE_REPLY_TIMEOUT_MS;

@@ -1,8 +1,8 @@
 #include "hardware/multimon.h"
 
-#include "hardware/adapters.h"
+#include "base/adapters.h"
+#include "base/state.h"
 #include "hardware/machine.h"
-#include "shell/globals.h"
 
 static_assert(sizeof(MONITORINFO) == 40, "the monitor information of Windows 98");
 

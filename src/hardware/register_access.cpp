@@ -1,8 +1,8 @@
 #include "hardware/register_access.h"
 
+#include "base/state.h"
 #include "hardware/driver_device.h"
 #include "hardware/machine.h"
-#include "shell/globals.h"
 
 HANDLE driver_handle;
 

@@ -7,7 +7,7 @@
 #include <string.h>
 #include <windows.h>
 
-#include "shell/globals.h"
+#include "base/state.h"
 
 static const int large_font_threshold = 108;  // dots per inch above this: large fonts
 enum { ENUM_BUFFER_SIZE = 63, FONT_FILE_SIZE = 64 };

@@ -4,21 +4,18 @@
 #include <stdlib.h>
 #include <string.h>
 
-#include "adjust/position.h"
+#include "base/adapters.h"
+#include "base/settings.h"
+#include "base/state.h"
 #include "chips/chips.h"
-#include "hardware/adapters.h"
-#include "hardware/companions.h"
 #include "hardware/machine.h"
-#include "hardware/shutdown.h"
 #include "modes/font_size.h"
+#include "modes/mode_keys.h"
 #include "modes/mode_list.h"
-#include "shell/globals.h"
-#include "shell/settings.h"
-#include "shell/texts.h"
+#include "modes/position.h"
 
 static_assert(sizeof(DEVMODEA) == 156, "the mode request of the standard size, no driver bytes");
 
-enum { TITLE_SIZE = 40, MESSAGE_SIZE = 255 };
 static const DWORD interlaced_display_flag = 2;
 static const int nt_safe_rate = 60;
 
@@ -50,6 +47,13 @@ static void BuildModeRequest(DEVMODEA* mode, DWORD mask, int width, int height, 
     mode->dmLogPixels = (WORD)dpi;
     mode->dmDisplayFrequency = (DWORD)frequency;
     mode->dmDisplayFlags = interlaced ? interlaced_display_flag : 0;
+}
+
+// The display driver finds what the chip driver asks for before the switch.
+static void PrepareDisplayDriver(int width, int height, int bits, int frequency)
+{
+    uint32_t needs = chip_prepare_mode((uint16_t)width, (uint16_t)height, (uint16_t)bits, (uint32_t)frequency);
+    if (needs & PREPARE_REFRESH_KEY) ModeKeyRefresh(width, height, bits, 1, frequency);
 }
 
 static void SaveMode(int refresh, int width, int height, int bits)
@@ -85,7 +89,7 @@ int SetRefreshRate(int target)
             safe.dmDisplayFlags = 0;
             MachineChangeDisplaySettings(&safe, 0);
         }
-        chip_prepare_mode(a->width, a->height, a->bits_per_pixel, (uint32_t)frequency);
+        PrepareDisplayDriver(a->width, a->height, a->bits_per_pixel, frequency);
         LONG r = MachineChangeDisplaySettings(&request, CDS_UPDATEREGISTRY);
         a->refresh_hz = (uint16_t)frequency;
         if (r != DISP_CHANGE_SUCCESSFUL) return 0;
@@ -156,7 +160,7 @@ LONG ApplyDisplayMode(HWND owner, DWORD mask, int width, int height, int bits, i
                      (mask & DM_DISPLAYFREQUENCY) && refresh < 50);
     uint16_t saved = a->refresh_hz;
     a->refresh_hz = REFRESH_CHANGE_MARKER;
-    chip_prepare_mode((uint16_t)width, (uint16_t)height, (uint16_t)bits, (uint32_t)frequency);
+    PrepareDisplayDriver(width, height, bits, frequency);
     LONG r = MachineChangeDisplaySettings(&request, CDS_UPDATEREGISTRY);
     a->refresh_hz = saved;
     if (r == DISP_CHANGE_SUCCESSFUL || r == DISP_CHANGE_RESTART) {
@@ -180,66 +184,4 @@ LONG ApplyDisplayMode(HWND owner, DWORD mask, int width, int height, int bits, i
     if ((mask & DM_LOGPIXELS) && (r == DISP_CHANGE_SUCCESSFUL || r == DISP_CHANGE_RESTART))
         SwitchFontSize(dpi_x, dpi_y);
     return r;
-}
-
-static int AskUser(HWND owner, const char* key, const char* fallback, UINT style)
-{
-    char title[TITLE_SIZE], text[MESSAGE_SIZE];
-    LoadText("DispChgTle", "Change Display Mode", title, sizeof title);
-    LoadText(key, fallback, text, sizeof text);
-    return MessageBoxA(owner, text, title, style);
-}
-
-static int OfferRestart(HWND owner)
-{
-    if (AskUser(owner, "RestartMsg",
-                "You need to restart windows to change settings. Do you want to restart now?",
-                MB_OKCANCEL | MB_ICONQUESTION) != IDOK)
-        return 1;
-    if (platform == PLATFORM_NT) {
-        EnableShutdownPrivilege();
-        restart_windows(EWX_REBOOT, 0);
-    } else {
-        GateRestart();
-    }
-    return 1;
-}
-
-int ApplyDesktopPage(HWND page, DesktopSelection* selection)
-{
-    const AdapterRecord* a = CurrentAdapter();
-    DesktopSelection before;
-    before.bits = a->bits_per_pixel;
-    before.width = a->width;
-    before.height = a->height;
-    before.refresh = a->refresh_hz;
-    HDC dc = GetDC(page);
-    before.dpi_x = GetDeviceCaps(dc, LOGPIXELSX);
-    before.dpi_y = GetDeviceCaps(dc, LOGPIXELSY);
-    ReleaseDC(page, dc);
-    if (platform == PLATFORM_NT && before.bits == 16 && NtDefaultBits() == 15) before.bits = 15;
-
-    DWORD mask = 0;
-    if (selection->bits != before.bits) mask |= DM_BITSPERPEL;
-    if (selection->width != before.width) mask |= DM_PELSWIDTH;
-    if (selection->height != before.height) mask |= DM_PELSHEIGHT;
-    if (selection->dpi_x != before.dpi_x || selection->dpi_y != before.dpi_y) mask |= DM_LOGPIXELS;
-    if (selection->refresh != before.refresh) mask |= DM_DISPLAYFREQUENCY;
-    if (!mask) return 0;
-
-    LONG r = ApplyDisplayMode(page, mask, selection->width, selection->height, selection->bits, selection->dpi_x,
-                              selection->dpi_y, selection->refresh);
-    if (r != DISP_CHANGE_SUCCESSFUL && r != DISP_CHANGE_RESTART) {
-        AskUser(page, "ChangeErr", "Cannot change to the specified display mode!", MB_ICONHAND);
-        return 0;
-    }
-    if (r == DISP_CHANGE_RESTART || mask == DM_LOGPIXELS) return OfferRestart(page);
-    if (AskUser(page, "DispConfirm", "Do you want to keep this settings?",
-                MB_OKCANCEL | MB_ICONQUESTION | MB_DEFBUTTON2) == IDOK) {
-        if (mask & DM_LOGPIXELS) return OfferRestart(page);
-        return 1;
-    }
-    *selection = before;
-    ApplyDisplayMode(page, mask, before.width, before.height, before.bits, before.dpi_x, before.dpi_y, before.refresh);
-    return 0;
 }

@@ -13,12 +13,4 @@ int ProgramRefreshClock(int rate);
 void SyncRefreshRate(int at_startup);
 LONG ApplyDisplayMode(HWND owner, DWORD mask, int width, int height, int bits, int dpi_x, int dpi_y, int refresh);
 
-// What the Desktop page has selected.
-struct DesktopSelection {
-    int width, height, bits;
-    int dpi_x, dpi_y;
-    int refresh;
-};
-int ApplyDesktopPage(HWND page, DesktopSelection* selection);
-
 #endif

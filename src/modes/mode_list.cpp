@@ -8,12 +8,15 @@
 #include <string.h>
 #include <windows.h>
 
+#include "base/adapters.h"
+#include "base/settings.h"
+#include "base/state.h"
 #include "chips/chips.h"
-#include "hardware/adapters.h"
+#include "hardware/driver_key.h"
 #include "hardware/machine.h"
 #include "modes/display_settings.h"
-#include "shell/globals.h"
-#include "shell/settings.h"
+#include "modes/mode_keys.h"
+#include "modes/rate_list.h"
 
 ModeEntry* mode_table;
 

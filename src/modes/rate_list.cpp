@@ -1,7 +1,7 @@
 #include <stdlib.h>
 #include <string.h>
 
-#include "modes/mode_list.h"
+#include "modes/rate_list.h"
 
 int ParseRateList(const char* text, int index)
 {

@@ -1,19 +1,16 @@
 #include "shell/main_window.h"
 
-#include "adjust/position.h"
+#include "base/adapters.h"
+#include "base/state.h"
+#include "base/texts.h"
 #include "chips/chips.h"
-#include "hardware/adapters.h"
 #include "hardware/companions.h"
-#include "hardware/detect.h"
+#include "modes/detect.h"
 #include "modes/display_settings.h"
 #include "modes/mode_change.h"
 #include "modes/mode_list.h"
-#include "shell/globals.h"
-#include "shell/texts.h"
+#include "modes/position.h"
 #include "shell/tray.h"
-
-uint16_t shell_state;
-uint32_t last_activity_tick;
 
 enum { NOCARD_TEXT_SIZE = 80 };
 

@@ -5,16 +5,7 @@
 #include <windows.h>
 #include <stdint.h>
 
-// Private messages; other programs use these numbers.
-enum {
-    MSG_QUERY_REFRESH = 1126,
-    MSG_GET_REFRESH = 1127,
-    MSG_SET_REFRESH = 1128,
-    MSG_POWER_STATE = 1134,
-    MSG_OPEN_MENU = 1152,
-    MSG_TRAY_CALLBACK = 1224,
-    MSG_GATE_REPLY = 1228,
-};
+#include "base/protocol.h"
 
 // The quiet time after user activity before the main window re-applies
 // refresh rates and positions on a redraw.

@@ -3,21 +3,11 @@
 #include <string.h>
 
 #include "adjust/adjust_window.h"
-#include "shell/globals.h"
+#include "base/protocol.h"
+#include "base/settings.h"
+#include "base/state.h"
 #include "shell/main_window.h"
-#include "shell/settings.h"
 #include "shell/tray.h"
-
-uint16_t platform;
-int16_t os_class;
-uint32_t startup_flags;
-char text_ini_path[INI_PATH_SIZE];
-char chip_ini_path[INI_PATH_SIZE];
-HINSTANCE instance;
-HWND main_window;
-
-const char main_window_class[] = "zentra";
-const char adjust_window_class[] = "ScreenAdjust";
 
 static_assert(sizeof(OSVERSIONINFOA) == 148, "the version structure Windows 95 knows");
 

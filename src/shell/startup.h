@@ -37,7 +37,4 @@ void BuildIniPaths(const char* module_path);
 
 int CreateMainWindow(HINSTANCE inst);
 
-extern const char main_window_class[];
-extern const char adjust_window_class[];
-
 #endif

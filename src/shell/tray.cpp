@@ -3,7 +3,7 @@
 #include <shellapi.h>
 #include <string.h>
 
-#include "shell/globals.h"
+#include "base/state.h"
 
 #if defined(__i386__)
 static_assert(sizeof(APPBARDATA) == 36, "the taskbar query of Windows 95 and NT 4.0");

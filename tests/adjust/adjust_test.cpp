@@ -6,9 +6,10 @@
 #include <string>
 
 #include "adjust/adjust_window.h"
-#include "adjust/position.h"
-#include "hardware/adapters.h"
-#include "shell/globals.h"
+#include "base/adapters.h"
+#include "base/protocol.h"
+#include "base/state.h"
+#include "modes/position.h"
 #include "shell/startup.h"
 #include "support/machine.h"
 #include "support/support.h"

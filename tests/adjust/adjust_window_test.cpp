@@ -5,9 +5,10 @@
 #include "adjust/adjust_pattern.h"
 #include "adjust/adjust_test.h"
 #include "adjust/adjust_window.h"
-#include "adjust/position.h"
+#include "base/protocol.h"
+#include "base/settings.h"
 #include "hardware/multimon.h"
-#include "shell/settings.h"
+#include "modes/position.h"
 #include "shell/startup.h"
 
 namespace {

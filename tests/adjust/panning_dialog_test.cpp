@@ -8,7 +8,10 @@
 #include "adjust/adjust_resources.h"
 #include "adjust/adjust_test.h"
 #include "adjust/panning_dialog.h"
+#include "hardware/driver_key.h"
+#include "modes/mode_keys.h"
 #include "modes/mode_list.h"
+#include "modes/rate_list.h"
 
 namespace {
 

@@ -1,9 +1,9 @@
 // Stepping, storing and restoring against the simulated CRT controller.
 #include "adjust/adjust_test.h"
-#include "adjust/position.h"
-#include "hardware/adapters.h"
-#include "shell/globals.h"
-#include "shell/settings.h"
+#include "base/adapters.h"
+#include "base/settings.h"
+#include "base/state.h"
+#include "modes/position.h"
 
 TEST(StepRule, RegisterBounds)
 {

@@ -8,11 +8,14 @@
 #include <stdio.h>
 #include <string.h>
 
-#include "hardware/adapters.h"
-#include "hardware/detect.h"
+#include "base/adapters.h"
+#include "base/state.h"
+#include "hardware/driver_key.h"
+#include "modes/detect.h"
 #include "modes/display_settings.h"
+#include "modes/mode_keys.h"
 #include "modes/mode_list.h"
-#include "shell/globals.h"
+#include "modes/rate_list.h"
 #include "sim.h"
 
 enum { BENCH_MODES = 100, BENCH_RATES = 10 };

@@ -2,13 +2,16 @@
 
 #include <math.h>
 
+#include "base/adapters.h"
+#include "base/state.h"
 #include "chips/chips.h"
 #include "chips/synth.h"
-#include "hardware/adapters.h"
-#include "hardware/detect.h"
+#include "hardware/driver_key.h"
+#include "modes/detect.h"
 #include "modes/mode_change.h"
+#include "modes/mode_keys.h"
 #include "modes/mode_list.h"
-#include "shell/globals.h"
+#include "modes/rate_list.h"
 #include "support/machine.h"
 #include "support/support.h"
 
@@ -236,14 +239,12 @@ TEST(S3Registers, InterlaceAgpAndCapabilities)
     EXPECT_EQ(0u, chip_init());  // NT does not ask the strap
 }
 
-TEST(S3Registers, PrepareModeStoresTheRateForThe9xDriver)
+TEST(S3Registers, PrepareModeAsksFor9xRefreshKey)
 {
     BootS3(0x8901);
-    chip_prepare_mode(800, 600, 16, 72);
-    EXPECT_EQ(72, ModeKeyRefresh(800, 600, 16, 0, 0));
+    EXPECT_EQ((uint32_t)PREPARE_REFRESH_KEY, chip_prepare_mode(800, 600, 16, 72));
     BootS3(0x8901, SIM_WINDOWS_NT4);
-    ChipModeRecord mode = {800, 600, 16, 72};
-    EXPECT_EQ(0u, chip_table[CurrentAdapter()->chip_row].Dispatch(CMD_PREPARE_MODE, (uintptr_t)&mode));
+    EXPECT_EQ(0u, chip_prepare_mode(800, 600, 16, 72));
 }
 
 TEST(S3Registers, Trio3D2XNeverTouchesThePixelClock)

@@ -9,10 +9,10 @@
 #include <vector>
 
 #include "../../companions/hookkeep.h"
+#include "base/settings.h"
 #include "hardware/companions.h"
 #include "power_window.h"
 #include "shell/main_window.h"
-#include "shell/settings.h"
 #include "shell/startup.h"
 
 namespace {

@@ -1,10 +1,13 @@
 #include <gtest/gtest.h>
 
+#include "base/adapters.h"
+#include "base/state.h"
 #include "chips/chips.h"
-#include "hardware/adapters.h"
-#include "hardware/detect.h"
+#include "hardware/driver_key.h"
 #include "hardware/multimon.h"
-#include "shell/globals.h"
+#include "modes/detect.h"
+#include "modes/mode_keys.h"
+#include "modes/rate_list.h"
 #include "shell/main_window.h"
 #include "support/machine.h"
 #include "support/support.h"

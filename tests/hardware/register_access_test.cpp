@@ -1,13 +1,16 @@
 #include <gtest/gtest.h>
 
+#include "base/adapters.h"
+#include "base/state.h"
 #include "chips/chips.h"
-#include "hardware/adapters.h"
-#include "hardware/detect.h"
 #include "hardware/driver_device.h"
+#include "hardware/driver_key.h"
 #include "hardware/machine.h"
 #include "hardware/pci.h"
 #include "hardware/register_access.h"
-#include "shell/globals.h"
+#include "modes/detect.h"
+#include "modes/mode_keys.h"
+#include "modes/rate_list.h"
 #include "support/machine.h"
 #include "support/support.h"
 

@@ -2,8 +2,8 @@
 
 #include <map>
 
+#include "base/state.h"
 #include "modes/font_size.h"
-#include "shell/globals.h"
 #include "support/support.h"
 
 static const char fontsize[] = "SOFTWARE\\Microsoft\\Windows\\CurrentVersion\\fontsize";

@@ -2,14 +2,18 @@
 
 #include <math.h>
 
-#include "hardware/adapters.h"
+#include "base/adapters.h"
+#include "base/settings.h"
+#include "base/state.h"
 #include "hardware/companions.h"
-#include "hardware/detect.h"
+#include "hardware/driver_key.h"
+#include "modes/detect.h"
 #include "modes/mode_change.h"
+#include "modes/mode_keys.h"
 #include "modes/mode_list.h"
-#include "shell/globals.h"
+#include "modes/rate_list.h"
+#include "pages/desktop_apply.h"
 #include "shell/main_window.h"
-#include "shell/settings.h"
 #include "shell/tray.h"
 #include "support/machine.h"
 #include "support/support.h"

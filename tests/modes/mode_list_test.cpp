@@ -1,13 +1,16 @@
 #include <gtest/gtest.h>
 
-#include "hardware/adapters.h"
-#include "hardware/detect.h"
+#include "base/adapters.h"
+#include "base/settings.h"
+#include "base/state.h"
+#include "hardware/driver_key.h"
 #include "hardware/machine.h"
+#include "modes/detect.h"
 #include "modes/display_settings.h"
+#include "modes/mode_keys.h"
 #include "modes/mode_list.h"
-#include "shell/globals.h"
+#include "modes/rate_list.h"
 #include "shell/main_window.h"
-#include "shell/settings.h"
 #include "support/machine.h"
 #include "support/support.h"
 

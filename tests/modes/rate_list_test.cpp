@@ -1,8 +1,11 @@
 #include <gtest/gtest.h>
 
-#include "hardware/adapters.h"
+#include "base/adapters.h"
+#include "base/state.h"
+#include "hardware/driver_key.h"
+#include "modes/mode_keys.h"
 #include "modes/mode_list.h"
-#include "shell/globals.h"
+#include "modes/rate_list.h"
 #include "support/support.h"
 
 TEST(ParseRateList, PositionsAndTheLastItem)

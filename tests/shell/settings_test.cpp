@@ -1,7 +1,7 @@
 #include <gtest/gtest.h>
 
-#include "hardware/adapters.h"
-#include "shell/settings.h"
+#include "base/adapters.h"
+#include "base/settings.h"
 #include "support/support.h"
 
 static const char card_key[] = "SOFTWARE\\QUORVEL\\PANEL\\12d20018";

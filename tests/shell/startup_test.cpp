@@ -1,6 +1,6 @@
 #include <gtest/gtest.h>
 
-#include "shell/globals.h"
+#include "base/state.h"
 #include "shell/main_window.h"
 #include "shell/startup.h"
 #include "shell/tray.h"

@@ -1,7 +1,7 @@
 #include <gtest/gtest.h>
 
-#include "shell/globals.h"
-#include "shell/texts.h"
+#include "base/state.h"
+#include "base/texts.h"
 #include "support/support.h"
 
 TEST(Texts, DefaultsWithoutTheFile)

@@ -2,9 +2,12 @@
 
 #include <string.h>
 
-#include "hardware/adapters.h"
-#include "hardware/detect.h"
-#include "shell/globals.h"
+#include "base/adapters.h"
+#include "base/state.h"
+#include "hardware/driver_key.h"
+#include "modes/detect.h"
+#include "modes/mode_keys.h"
+#include "modes/rate_list.h"
 #include "support/support.h"
 
 SimCardConfig Card(uint16_t vendor_id, uint16_t device_id, uint8_t bus, uint8_t device)

@@ -4,13 +4,16 @@
 
 #include <vector>
 
-#include "adjust/position.h"
-#include "hardware/adapters.h"
+#include "base/adapters.h"
+#include "base/settings.h"
+#include "base/state.h"
+#include "hardware/driver_key.h"
 #include "hardware/register_access.h"
 #include "modes/display_settings.h"
+#include "modes/mode_keys.h"
 #include "modes/mode_list.h"
-#include "shell/globals.h"
-#include "shell/settings.h"
+#include "modes/position.h"
+#include "modes/rate_list.h"
 
 void ResetProgramState(const std::string& text_ini, const std::string& chip_ini)
 {

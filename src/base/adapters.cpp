@@ -1,4 +1,4 @@
-#include "hardware/adapters.h"
+#include "base/adapters.h"
 
 AdapterRecord adapter_table[MAX_ADAPTERS];
 int16_t adapter_count;

@@ -2,9 +2,10 @@
 
 #include <windows.h>
 
-#include "chips/families.h"
-#include "hardware/adapters.h"
-#include "shell/globals.h"
+#include "base/adapters.h"
+#include "base/state.h"
+#include "chips/s3.h"
+#include "chips/unsupported.h"
 
 #define S3_FAMILY S3Dispatch, S3SetPixelClock, S3GetPixelClock
 #define UNSUPPORTED_FAMILY UnsupportedDispatch, UnsupportedSetPixelClock, UnsupportedGetPixelClock
@@ -51,10 +52,10 @@ uint32_t chip_write_port(uint32_t port, uint32_t value)
 uint32_t chip_read_port(uint32_t port) { return Command(CMD_READ_PORT, port); }
 uint32_t chip_get_mem_size() { return Command(CMD_GET_MEM_SIZE); }
 
-void chip_prepare_mode(uint16_t width, uint16_t height, uint16_t bits, uint32_t refresh)
+uint32_t chip_prepare_mode(uint16_t width, uint16_t height, uint16_t bits, uint32_t refresh)
 {
     ChipModeRecord mode = {width, height, bits, refresh};
-    Command(CMD_PREPARE_MODE, (uintptr_t)&mode);
+    return Command(CMD_PREPARE_MODE, (uintptr_t)&mode);
 }
 
 uint32_t chip_hide_page(uint32_t page) { return Command(CMD_HIDE_PAGE, page); }

@@ -1,7 +1,7 @@
 // Process-wide state shared by every subsystem. All of it lives for the life
 // of the process and is touched only from the thread of the message loop.
-#ifndef VISTREL_GLOBALS_H
-#define VISTREL_GLOBALS_H
+#ifndef VISTREL_STATE_H
+#define VISTREL_STATE_H
 
 #include <windows.h>
 #include <stdint.h>
@@ -30,6 +30,7 @@ extern char chip_ini_path[INI_PATH_SIZE];
 extern HINSTANCE instance;
 extern HWND main_window;
 extern uint16_t shell_state;
+
 extern uint32_t last_activity_tick;
 
 // The Windows 98 family member that can have several display devices.

@@ -1,13 +1,13 @@
 // The picture is moved by the CRT controller's horizontal and vertical
 // retrace start alone; blank, retrace end and totals stay as the mode set them.
-#include "adjust/position.h"
+#include "modes/position.h"
 
 #include <windows.h>
 
+#include "base/adapters.h"
+#include "base/settings.h"
 #include "chips/chip_io.h"
 #include "chips/chips.h"
-#include "hardware/adapters.h"
-#include "shell/settings.h"
 
 int adjust_offset_h, adjust_offset_v;
 

@@ -1,6 +1,6 @@
-#include "shell/texts.h"
+#include "base/texts.h"
 
-#include "shell/globals.h"
+#include "base/state.h"
 
 int LoadText(const char* key, const char* fallback, char* buf, int size)
 {

@@ -1,10 +1,10 @@
-#include "shell/settings.h"
+#include "base/settings.h"
 
 #include <stdio.h>
 #include <string.h>
 #include <windows.h>
 
-#include "hardware/adapters.h"
+#include "base/adapters.h"
 
 const char settings_program_key[] = "SOFTWARE\\QUORVEL\\PANEL";
 

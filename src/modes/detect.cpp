@@ -1,4 +1,4 @@
-#include "hardware/detect.h"
+#include "modes/detect.h"
 
 #include <ctype.h>
 #include <stddef.h>
@@ -6,16 +6,16 @@
 #include <string.h>
 #include <windows.h>
 
+#include "base/adapters.h"
+#include "base/settings.h"
+#include "base/state.h"
 #include "chips/chips.h"
-#include "hardware/adapters.h"
 #include "hardware/driver_device.h"
+#include "hardware/driver_key.h"
 #include "hardware/machine.h"
 #include "hardware/pci.h"
-#include "hardware/registry_text.h"
 #include "modes/mode_change.h"
 #include "modes/mode_list.h"
-#include "shell/globals.h"
-#include "shell/settings.h"
 
 static const uint16_t riva_128zx = 0x0019;
 static const uint16_t riva_128 = 0x0018;
@@ -263,76 +263,4 @@ void RefreshAdapterModes(int at_startup)
     a->bits_per_pixel = (uint16_t)TrueBitsPerPixel(GetDeviceCaps(dc, BITSPIXEL));
     ReleaseDC(NULL, dc);
     SyncRefreshRate(at_startup);
-}
-
-static void UpperCase(char* s)
-{
-    for (; *s; ++s) *s = (char)toupper((unsigned char)*s);
-}
-
-// The Config Manager node of the current adapter: its key name below
-// "Config Manager\Enum" and its hardware key.
-static int FindDeviceNode(char* node, DWORD node_size, char* hardware_key, DWORD key_size)
-{
-    const AdapterRecord* a = CurrentAdapter();
-    char pci[40], location[40];
-    snprintf(pci, sizeof pci, "PCI\\VEN_%04x&DEV_%04x", a->vendor_id, a->device_id);
-    snprintf(location, sizeof location, "BUS_%02x&DEV_%02x", a->bus, a->devfn >> 3);
-    UpperCase(pci);
-    UpperCase(location);
-    HKEY nodes;
-    if (RegOpenKeyExA(HKEY_DYN_DATA, config_manager_enum, 0, KEY_READ, &nodes) != ERROR_SUCCESS) return 0;
-    int found = 0;
-    for (DWORD i = 0; !found; ++i) {
-        DWORD length = node_size;
-        LONG r = RegEnumKeyExA(nodes, i, node, &length, NULL, NULL, NULL, NULL);
-        if (r == ERROR_MORE_DATA) continue;  // a name too long to be ours
-        if (r != ERROR_SUCCESS) break;
-        if (!ReadRegistryText(nodes, node, "HardWareKey", hardware_key, key_size)) continue;
-        UpperCase(hardware_key);
-        if (!strstr(hardware_key, pci)) continue;
-        if ((a->flags & ADAPTER_TWIN) && !strstr(hardware_key, location)) continue;
-        found = 1;
-    }
-    RegCloseKey(nodes);
-    return found;
-}
-
-int FindDriverKey(char* out)
-{
-    out[0] = 0;
-    if (platform == PLATFORM_NT) {
-        char path[DRIVER_KEY_SIZE];
-        if (!ReadRegistryText(HKEY_LOCAL_MACHINE, nt_video_map, nt_video0_value, path, sizeof path)) return -1;
-        // "\Registry\Machine\System\..." -> "System\..."
-        const char* rest = path + 1;
-        for (int i = 0; i < 2 && rest; ++i) {
-            rest = strchr(rest, '\\');
-            if (rest) ++rest;
-        }
-        if (!rest) return -1;
-        lstrcpynA(out, rest, DRIVER_KEY_SIZE);
-        return 1;
-    }
-    char node[HARDWARE_KEY_SIZE], hardware_key[HARDWARE_KEY_SIZE];
-    if (!FindDeviceNode(node, sizeof node, hardware_key, sizeof hardware_key)) return -1;
-    char enum_path[HARDWARE_KEY_SIZE + 8], driver[HARDWARE_KEY_SIZE];
-    snprintf(enum_path, sizeof enum_path, "Enum\\%s", hardware_key);
-    if (!ReadRegistryText(HKEY_LOCAL_MACHINE, enum_path, "Driver", driver, sizeof driver) || !driver[0]) return -1;
-    snprintf(out, DRIVER_KEY_SIZE, "%s%s", class_key_prefix, driver);
-    return 1;
-}
-
-int ReadDeviceNodeValue(const char* name, uint32_t* out)
-{
-    char node[NODE_KEY_SIZE], hardware_key[NODE_KEY_SIZE];
-    if (!FindDeviceNode(node, sizeof node, hardware_key, sizeof hardware_key)) return -1;
-    char path[sizeof config_manager_enum + NODE_KEY_SIZE + 1];
-    snprintf(path, sizeof path, "%s\\%s", config_manager_enum, node);
-    HKEY key;
-    if (RegOpenKeyExA(HKEY_DYN_DATA, path, 0, KEY_READ, &key) != ERROR_SUCCESS) return 0;
-    DWORD size = sizeof *out;
-    LONG r = RegQueryValueExA(key, name, NULL, NULL, (BYTE*)out, &size);
-    RegCloseKey(key);
-    return r == ERROR_SUCCESS ? 1 : 0;
 }

@@ -1,0 +1,182 @@
+// The display driver's own registry key and the device node of a card:
+// where Windows keeps what it knows about the current adapter.
+#include "hardware/driver_key.h"
+
+#include <ctype.h>
+#include <stdio.h>
+#include <string.h>
+#include <windows.h>
+
+#include "base/adapters.h"
+#include "base/state.h"
+#include "hardware/registry_text.h"
+
+static const char config_manager_enum[] = "Config Manager\\Enum";
+static const char class_key_prefix[] = "System\\CurrentControlSet\\Services\\Class\\";
+static const char nt_video_map[] = "hardware\\devicemap\\video";
+static const char nt_video0_value[] = "\\device\\video0";
+static const char nt_resource_map[] = "hardware\\resourcemap\\video";
+static const char nt_primary_raw[] = "\\Device\\Video0.Raw";
+static const char nt_services[] = "System\\CurrentControlSet\\Services\\";
+static const char nt_bits_value[] = "DefaultSettings.BitsPerPel";
+enum {
+    VALUE_TEXT_SIZE = 80,
+    KEY_PATH_SIZE = DRIVER_KEY_SIZE + 64,
+    SERVICE_NAME_SIZE = 80,
+    HARDWARE_KEY_SIZE = 120,
+    NODE_KEY_SIZE = 80,
+};
+
+static void UpperCase(char* s)
+{
+    for (; *s; ++s) *s = (char)toupper((unsigned char)*s);
+}
+
+// The Config Manager node of the current adapter: its key name below
+// "Config Manager\Enum" and its hardware key.
+static int FindDeviceNode(char* node, DWORD node_size, char* hardware_key, DWORD key_size)
+{
+    const AdapterRecord* a = CurrentAdapter();
+    char pci[40], location[40];
+    snprintf(pci, sizeof pci, "PCI\\VEN_%04x&DEV_%04x", a->vendor_id, a->device_id);
+    snprintf(location, sizeof location, "BUS_%02x&DEV_%02x", a->bus, a->devfn >> 3);
+    UpperCase(pci);
+    UpperCase(location);
+    HKEY nodes;
+    if (RegOpenKeyExA(HKEY_DYN_DATA, config_manager_enum, 0, KEY_READ, &nodes) != ERROR_SUCCESS) return 0;
+    int found = 0;
+    for (DWORD i = 0; !found; ++i) {
+        DWORD length = node_size;
+        LONG r = RegEnumKeyExA(nodes, i, node, &length, NULL, NULL, NULL, NULL);
+        if (r == ERROR_MORE_DATA) continue;  // a name too long to be ours
+        if (r != ERROR_SUCCESS) break;
+        if (!ReadRegistryText(nodes, node, "HardWareKey", hardware_key, key_size)) continue;
+        UpperCase(hardware_key);
+        if (!strstr(hardware_key, pci)) continue;
+        if ((a->flags & ADAPTER_TWIN) && !strstr(hardware_key, location)) continue;
+        found = 1;
+    }
+    RegCloseKey(nodes);
+    return found;
+}
+
+int FindDriverKey(char* out)
+{
+    out[0] = 0;
+    if (platform == PLATFORM_NT) {
+        char path[DRIVER_KEY_SIZE];
+        if (!ReadRegistryText(HKEY_LOCAL_MACHINE, nt_video_map, nt_video0_value, path, sizeof path)) return -1;
+        // "\Registry\Machine\System\..." -> "System\..."
+        const char* rest = path + 1;
+        for (int i = 0; i < 2 && rest; ++i) {
+            rest = strchr(rest, '\\');
+            if (rest) ++rest;
+        }
+        if (!rest) return -1;
+        lstrcpynA(out, rest, DRIVER_KEY_SIZE);
+        return 1;
+    }
+    char node[HARDWARE_KEY_SIZE], hardware_key[HARDWARE_KEY_SIZE];
+    if (!FindDeviceNode(node, sizeof node, hardware_key, sizeof hardware_key)) return -1;
+    char enum_path[HARDWARE_KEY_SIZE + 8], driver[HARDWARE_KEY_SIZE];
+    snprintf(enum_path, sizeof enum_path, "Enum\\%s", hardware_key);
+    if (!ReadRegistryText(HKEY_LOCAL_MACHINE, enum_path, "Driver", driver, sizeof driver) || !driver[0]) return -1;
+    snprintf(out, DRIVER_KEY_SIZE, "%s%s", class_key_prefix, driver);
+    return 1;
+}
+
+int ReadDeviceNodeValue(const char* name, uint32_t* out)
+{
+    char node[NODE_KEY_SIZE], hardware_key[NODE_KEY_SIZE];
+    if (!FindDeviceNode(node, sizeof node, hardware_key, sizeof hardware_key)) return -1;
+    char path[sizeof config_manager_enum + NODE_KEY_SIZE + 1];
+    snprintf(path, sizeof path, "%s\\%s", config_manager_enum, node);
+    HKEY key;
+    if (RegOpenKeyExA(HKEY_DYN_DATA, path, 0, KEY_READ, &key) != ERROR_SUCCESS) return 0;
+    DWORD size = sizeof *out;
+    LONG r = RegQueryValueExA(key, name, NULL, NULL, (BYTE*)out, &size);
+    RegCloseKey(key);
+    return r == ERROR_SUCCESS ? 1 : 0;
+}
+
+int DriverKeyValue(const char* subkey, const char* name, void* buffer, uint32_t size, uint32_t type, int read)
+{
+    char path[KEY_PATH_SIZE];
+    if (FindDriverKey(path) != 1) return -1;
+    if (strlen(path) + strlen(subkey) >= sizeof path) return -1;
+    strcat(path, subkey);
+    HKEY key;
+    if (RegOpenKeyExA(HKEY_LOCAL_MACHINE, path, 0, read ? KEY_READ : KEY_WRITE, &key) != ERROR_SUCCESS) return -1;
+    LONG r;
+    if (read) {
+        DWORD length = size;
+        r = RegQueryValueExA(key, name, NULL, NULL, (BYTE*)buffer, &length);
+    } else {
+        r = RegSetValueExA(key, name, 0, type, (const BYTE*)buffer, size);
+    }
+    RegCloseKey(key);
+    return r == ERROR_SUCCESS ? 1 : -1;
+}
+
+int DriverImageName(char* out)
+{
+    out[0] = 0;
+    char path[KEY_PATH_SIZE];
+    if (FindDriverKey(path) != 1) return -1;
+    int ok;
+    if (platform == PLATFORM_NT) {
+        char* last = strrchr(path, '\\');
+        if (last) *last = 0;
+        ok = ReadRegistryText(HKEY_LOCAL_MACHINE, path, "imagepath", out, VALUE_TEXT_SIZE);
+    } else {
+        strcat(path, "\\DEFAULT");
+        ok = ReadRegistryText(HKEY_LOCAL_MACHINE, path, "drv", out, VALUE_TEXT_SIZE);
+    }
+    if (!ok) out[0] = 0;
+    return ok ? 1 : -1;
+}
+
+// The video service whose key names the primary display's raw device.
+static int FindPrimaryVideoService(char* service, DWORD size)
+{
+    HKEY map;
+    if (RegOpenKeyExA(HKEY_LOCAL_MACHINE, nt_resource_map, 0, KEY_READ, &map) != ERROR_SUCCESS) return 0;
+    int found = 0;
+    for (DWORD i = 0; !found; ++i) {
+        DWORD length = size;
+        LONG r = RegEnumKeyExA(map, i, service, &length, NULL, NULL, NULL, NULL);
+        if (r == ERROR_MORE_DATA) continue;
+        if (r != ERROR_SUCCESS) break;
+        HKEY key;
+        if (RegOpenKeyExA(map, service, 0, KEY_READ, &key) != ERROR_SUCCESS) continue;
+        found = RegQueryValueExA(key, nt_primary_raw, NULL, NULL, NULL, NULL) == ERROR_SUCCESS;
+        RegCloseKey(key);
+    }
+    RegCloseKey(map);
+    return found;
+}
+
+int NtDefaultBits()
+{
+    char service[SERVICE_NAME_SIZE];
+    if (!FindPrimaryVideoService(service, sizeof service)) return 0;
+    char path[sizeof nt_services + SERVICE_NAME_SIZE + 16];
+    snprintf(path, sizeof path, "%s%s\\device0", nt_services, service);
+    HKEY key;
+    if (RegOpenKeyExA(HKEY_CURRENT_CONFIG, path, 0, KEY_READ, &key) != ERROR_SUCCESS) return 0;
+    DWORD bits = 0, size = sizeof bits, type = 0;
+    LONG r = RegQueryValueExA(key, nt_bits_value, NULL, &type, (BYTE*)&bits, &size);
+    RegCloseKey(key);
+    if (r != ERROR_SUCCESS || size != sizeof bits) return 0;
+    switch (bits) {
+    case 8: case 15: case 16: case 24: case 32: return (int)bits;
+    }
+    return 0;
+}
+
+int TrueBitsPerPixel(int bits)
+{
+    // NT reports 16 for 15-bit modes too; its registry tells them apart.
+    if (platform == PLATFORM_NT && bits == 16 && NtDefaultBits() == 15) return 15;
+    return bits;
+}
