@@ -3,6 +3,7 @@
 #include "adjust/adjust_window.h"
 
 #include "adjust/adjust_pattern.h"
+#include "base/module_reset.h"
 #include "base/protocol.h"
 #include "base/state.h"
 #include "base/texts.h"
@@ -17,6 +18,13 @@ static const UINT default_beep = 0xFFFFFFFF;
 // The save question runs a message loop of its own; a key that reaches
 // the window meanwhile must not ask again or step the picture.
 static bool question_open;
+
+static void ResetAdjustWindow()
+{
+    adjust_beep = MessageBeep;
+    question_open = false;
+}
+VISTREL_MODULE_RESET(ResetAdjustWindow);
 
 void ResetAdjustOffsets()
 {

@@ -5,6 +5,7 @@
 #include <windows.h>
 
 #include "base/adapters.h"
+#include "base/number.h"
 
 const char settings_program_key[] = "SOFTWARE\\QUORVEL\\PANEL";
 
@@ -50,19 +51,6 @@ static void BuildValueName(int id, char* name)
     }
 }
 
-int32_t ParseStoredNumber(const char* data, unsigned length)
-{
-    unsigned i = 0;
-    while (i < length && (data[i] == ' ' || data[i] == '\t' || data[i] == '\n' || data[i] == '\r' ||
-                          data[i] == '\v' || data[i] == '\f'))
-        ++i;
-    bool negative = false;
-    if (i < length && (data[i] == '+' || data[i] == '-')) negative = data[i++] == '-';
-    uint32_t value = 0;
-    while (i < length && data[i] >= '0' && data[i] <= '9') value = value * 10 + (uint32_t)(data[i++] - '0');
-    return (int32_t)(negative ? 0u - value : value);
-}
-
 static void EraseStore(HKEY program)
 {
     char name[MAX_PATH];
@@ -81,7 +69,7 @@ static int32_t LoadFromKey(HKEY key, const char* name)
     char data[LOAD_BUFFER_SIZE];
     DWORD size = sizeof data;
     if (RegQueryValueExA(key, name, NULL, NULL, (BYTE*)data, &size) != ERROR_SUCCESS) return -1;
-    return ParseStoredNumber(data, size);
+    return ParseNumber(data, size);
 }
 
 static int32_t SaveToKey(HKEY key, int id, const char* name, int32_t value)

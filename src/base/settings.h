@@ -30,7 +30,4 @@ int32_t SaveSetting(int id, int32_t value);
 // Erases every card key and the power-saving timers.
 void ResetSettings();
 
-// Reads a decimal number from registry data that need not be terminated.
-int32_t ParseStoredNumber(const char* data, unsigned length);
-
 #endif

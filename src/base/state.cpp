@@ -1,5 +1,7 @@
 #include "base/state.h"
 
+#include "base/module_reset.h"
+
 uint16_t platform;
 int16_t os_class;
 uint32_t startup_flags;
@@ -9,3 +11,17 @@ HINSTANCE instance;
 HWND main_window;
 uint16_t shell_state;
 uint32_t last_activity_tick;
+
+static void ResetState()
+{
+    platform = 0;
+    os_class = 0;
+    startup_flags = 0;
+    text_ini_path[0] = 0;
+    chip_ini_path[0] = 0;
+    instance = GetModuleHandleA(NULL);
+    main_window = NULL;
+    shell_state = 0;
+    last_activity_tick = 0;
+}
+VISTREL_MODULE_RESET(ResetState);

@@ -2,6 +2,7 @@
 
 #include <stdio.h>
 
+#include "base/module_reset.h"
 #include "base/protocol.h"
 #include "base/settings.h"
 #include "hookkeep.h"
@@ -47,6 +48,15 @@ uint32_t GateMemorySize()
 }
 
 void ForgetGateMemorySize() { gate_memory_size = 0; }
+
+static void ResetCompanions()
+{
+    restart_windows = ExitWindowsEx;
+    gate_reply_timeout = GATE_REPLY_TIMEOUT_MS;
+    power_minute_length = KEEP_REAL_MINUTE;
+    gate_memory_size = 0;
+}
+VISTREL_MODULE_RESET(ResetCompanions);
 
 int StartPowerTimers(HWND main_window, int on)
 {

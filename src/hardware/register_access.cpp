@@ -1,10 +1,14 @@
 #include "hardware/register_access.h"
 
+#include "base/module_reset.h"
 #include "base/state.h"
 #include "hardware/driver_device.h"
 #include "hardware/machine.h"
 
 HANDLE driver_handle;
+
+static void ResetRegisterAccess() { driver_handle = NULL; }
+VISTREL_MODULE_RESET(ResetRegisterAccess);
 
 int OpenRegisterAccess()
 {

@@ -3,6 +3,8 @@
 #include <string.h>
 #include <windows.h>
 
+#include "base/module_reset.h"
+#include "base/number.h"
 #include "hardware/machine.h"
 
 enum { LISTED_MODES_KEPT = 2048 };
@@ -21,7 +23,8 @@ static bool ReadMode(DWORD n, ListedMode* out)
     out->width = (uint16_t)mode.dmPelsWidth;
     out->height = (uint16_t)mode.dmPelsHeight;
     out->bits_per_pixel = (uint16_t)mode.dmBitsPerPel;
-    out->frequency = (uint16_t)mode.dmDisplayFrequency;
+    // A frequency too large for a rate counts as none, not as its low bits.
+    out->frequency = mode.dmDisplayFrequency <= RATE_HIGHEST ? (uint16_t)mode.dmDisplayFrequency : 0;
     const char* name = (const char*)mode.dmDeviceName;
     out->vga_device = (name[0] | 0x20) == 'v' && (name[1] | 0x20) == 'g' && (name[2] | 0x20) == 'a';
     return true;
@@ -58,3 +61,4 @@ void ForgetDisplaySettings()
     walked = false;
     listed_count = 0;
 }
+VISTREL_MODULE_RESET(ForgetDisplaySettings);

@@ -5,6 +5,7 @@
 #include <string.h>
 
 #include "base/adapters.h"
+#include "base/number.h"
 #include "base/settings.h"
 #include "base/state.h"
 #include "chips/chips.h"
@@ -66,7 +67,7 @@ static void SaveMode(int refresh, int width, int height, int bits)
 
 int SetRefreshRate(int target)
 {
-    if (target <= 1) return 0;
+    if (target <= 1 || !FitsRate(target)) return 0;
     AdapterRecord* a = CurrentAdapter();
     int current = MeasuredRefreshRate();
     if (RefreshCloseEnough(target, current)) {
@@ -95,7 +96,8 @@ int SetRefreshRate(int target)
         if (r != DISP_CHANGE_SUCCESSFUL) return 0;
     }
     current = MeasuredRefreshRate();
-    if (max < target || abs(current - target) > 5) ProgramRefreshClock(target);
+    // A rate the clock could not reach is not running: nothing to keep.
+    if ((max < target || abs(current - target) > 5) && !ProgramRefreshClock(target)) return 0;
     SaveMode(target, a->width, a->height, a->bits_per_pixel);
     a->refresh_hz = (uint16_t)target;
     return 1;
@@ -120,7 +122,7 @@ static int ChosenRateOfCurrentMode()
 {
     const AdapterRecord* a = CurrentAdapter();
     int32_t chosen = LoadSetting(SETTING_REFRESH);
-    if (chosen <= 0) return 0;
+    if (chosen <= 0 || !FitsRate(chosen)) return 0;
     if (LoadSetting(SETTING_BITS) != a->bits_per_pixel || LoadSetting(SETTING_WIDTH) != a->width ||
         LoadSetting(SETTING_HEIGHT) != a->height)
         return 0;

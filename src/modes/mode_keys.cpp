@@ -7,10 +7,19 @@
 #include <string.h>
 #include <windows.h>
 
+#include "base/number.h"
 #include "hardware/driver_key.h"
 #include "hardware/registry_text.h"
 
 enum { VALUE_TEXT_SIZE = 80 };
+
+// A refresh value as the display driver keeps it; a number too large to be
+// a rate counts as no value.
+static int StoredRate(const char* text)
+{
+    int32_t hz = ParseNumber(text, strlen(text));
+    return FitsRate(hz) ? hz : -1;
+}
 
 static void ModeKeyPath(int width, int height, int bits, char* out, size_t size)
 {
@@ -50,16 +59,18 @@ int ModeKeyRefresh(int width, int height, int bits, int write, int value)
     char text[VALUE_TEXT_SIZE + 1];
     memset(text, 0, sizeof text);
     if (DriverKeyValue(subkey, "RefreshRate", text, VALUE_TEXT_SIZE, REG_SZ, 1) != 1 || !text[0]) return -1;
-    return atoi(text);
+    return StoredRate(text);
 }
 
 int DefaultKeyRefresh()
 {
     char text[VALUE_TEXT_SIZE + 1];
     memset(text, 0, sizeof text);
-    if (DriverKeyValue("\\DEFAULT", "RefreshRate", text, VALUE_TEXT_SIZE, REG_SZ, 1) == 1 && text[0] && atoi(text) > 0)
-        return atoi(text);
+    if (DriverKeyValue("\\DEFAULT", "RefreshRate", text, VALUE_TEXT_SIZE, REG_SZ, 1) == 1 && text[0]) {
+        int hz = StoredRate(text);
+        if (hz > 0) return hz;
+    }
     if (!ReadRegistryText(HKEY_CURRENT_CONFIG, "Display\\Settings", "RefreshRate", text, sizeof text)) return -1;
-    return atoi(text);
+    return StoredRate(text);
 }
 

@@ -9,6 +9,8 @@
 #include <windows.h>
 
 #include "base/adapters.h"
+#include "base/module_reset.h"
+#include "base/number.h"
 #include "base/settings.h"
 #include "base/state.h"
 #include "chips/chips.h"
@@ -228,7 +230,7 @@ int SavedRefreshRate()
     const AdapterRecord* a = CurrentAdapter();
     if (a->refresh_hz != 0) return a->refresh_hz;
     int32_t saved = LoadSetting(SETTING_REFRESH);
-    if (saved > 0) {
+    if (saved > 0 && FitsRate(saved)) {
         if (LoadSetting(SETTING_BITS) == a->bits_per_pixel && LoadSetting(SETTING_WIDTH) == a->width &&
             LoadSetting(SETTING_HEIGHT) == a->height)
             return saved;
@@ -261,6 +263,7 @@ void FreeModeTable()
     free(mode_table);
     mode_table = NULL;
 }
+VISTREL_MODULE_RESET(FreeModeTable);
 
 struct TableBuild {
     int include_15bit;

@@ -1,7 +1,16 @@
-#include <stdlib.h>
+#include "modes/rate_list.h"
+
 #include <string.h>
 
-#include "modes/rate_list.h"
+#include "base/number.h"
+
+// An item runs to the next comma or the end; a number too large to be a
+// rate reads as no rate.
+static int RateItem(const char* item)
+{
+    int32_t hz = ParseNumber(item, strlen(item));
+    return FitsRate(hz) ? hz : 0;
+}
 
 int ParseRateList(const char* text, int index)
 {
@@ -10,7 +19,7 @@ int ParseRateList(const char* text, int index)
     if (index == RATE_LAST) {
         const char* comma = strrchr(text, ',');
         if (comma) item = comma + 1;
-        return atoi(item);
+        return RateItem(item);
     }
     if (index < 0) return 0;
     for (int k = 0; k < index; ++k) {
@@ -18,7 +27,7 @@ int ParseRateList(const char* text, int index)
         if (!item) return 0;
         ++item;
     }
-    return atoi(item);
+    return RateItem(item);
 }
 
 int CountRateListItems(const char* text)

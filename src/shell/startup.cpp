@@ -110,29 +110,25 @@ int DetectSystemFrom(const SystemFacts* facts)
     return 0;
 }
 
-static void CopyCut(char* dst, const char* src, size_t size)
-{
-    size_t n = strlen(src);
-    if (n > size - 1) n = size - 1;
-    memcpy(dst, src, n);
-    dst[n] = 0;
-}
+static const char text_ini_name[] = "ZNTR2.INI";
+static const char chip_ini_name[] = "ZNTR3.INI";
 
-static void AppendCut(char* dst, const char* src, size_t size)
+// A path that does not fit is left empty, so that every text and setting
+// falls back to its built-in default: a cut path could name another file.
+static void BuildIniPath(char* out, const char* module_path, size_t folder_length, const char* name)
 {
-    size_t used = strlen(dst);
-    if (used < size - 1) CopyCut(dst + used, src, size - used);
+    out[0] = 0;
+    if (folder_length + strlen(name) > INI_PATH_SIZE - 1) return;
+    memcpy(out, module_path, folder_length);
+    strcpy(out + folder_length, name);
 }
 
 void BuildIniPaths(const char* module_path)
 {
-    CopyCut(text_ini_path, module_path, sizeof text_ini_path);
-    char* last = strrchr(text_ini_path, '\\');
-    if (last) last[1] = 0;
-    else text_ini_path[0] = 0;
-    CopyCut(chip_ini_path, text_ini_path, sizeof chip_ini_path);
-    AppendCut(text_ini_path, "ZNTR2.INI", sizeof text_ini_path);
-    AppendCut(chip_ini_path, "ZNTR3.INI", sizeof chip_ini_path);
+    const char* last = strrchr(module_path, '\\');
+    size_t folder_length = last ? (size_t)(last - module_path) + 1 : 0;
+    BuildIniPath(text_ini_path, module_path, folder_length, text_ini_name);
+    BuildIniPath(chip_ini_path, module_path, folder_length, chip_ini_name);
 }
 
 int DetectSystem()
@@ -154,7 +150,8 @@ int DetectSystem()
 
     char module_path[MAX_PATH];
     DWORD length = GetModuleFileNameA(NULL, module_path, sizeof module_path);
-    if (length >= sizeof module_path) length = sizeof module_path - 1;
+    // A name that filled the buffer may have been cut: no folder to trust.
+    if (length == 0 || length >= sizeof module_path) length = 0;
     module_path[length] = 0;
     BuildIniPaths(module_path);
     return 1;

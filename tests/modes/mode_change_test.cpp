@@ -84,6 +84,25 @@ TEST_F(ModeChange, AnExtendedRateIsReachedThroughThePixelClock)
     }
 }
 
+// A rate the synthesizer cannot reach is not running: it must not be
+// stored for the next start, nor believed in effect.
+TEST_F(ModeChange, ARateTheClockCannotReachIsNeitherStoredNorBelieved)
+{
+    Boot(SIM_WINDOWS_98);
+    const AdapterRecord* a = CurrentAdapter();
+    char key[32];
+    snprintf(key, sizeof key, "%dx%dx%d", a->width, a->height, a->bits_per_pixel);
+    WritePrivateProfileStringA("CHIP8901_95E", key, "400", chip_ini.c_str());
+    int before = a->refresh_hz;
+    EXPECT_EQ(0, SetRefreshRate(400));
+    EXPECT_NE(400, a->refresh_hz);
+    EXPECT_EQ(-1, LoadSetting(SETTING_REFRESH));
+    EXPECT_NEAR(MaxRefreshRate(a->width, a->height, a->bits_per_pixel), SimRefreshHz(0), 1.0);
+    // Beyond 16 bits a number is no rate at all.
+    EXPECT_EQ(0, SetRefreshRate(65536 + before));
+    EXPECT_EQ(-1, LoadSetting(SETTING_REFRESH));
+}
+
 TEST_F(ModeChange, AnUnclampedChipAsksWindowsForTheRateItself)
 {
     Boot(SIM_WINDOWS_98);

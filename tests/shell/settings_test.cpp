@@ -1,6 +1,7 @@
 #include <gtest/gtest.h>
 
 #include "base/adapters.h"
+#include "base/number.h"
 #include "base/settings.h"
 #include "support/support.h"
 
@@ -55,9 +56,23 @@ TEST_F(SettingsStore, ReadingStopsAtTheDataLength)
     WriteRegistryString(HKEY_LOCAL_MACHINE, program_key, "Shutoff", "-1", false);
     EXPECT_EQ(1234567890, LoadSetting(SETTING_REFRESH));
     EXPECT_EQ(-1, LoadSetting(SETTING_SHUTOFF));
-    EXPECT_EQ(12, ParseStoredNumber("123", 2));
-    EXPECT_EQ(-7, ParseStoredNumber("  -7", 4));
-    EXPECT_EQ(0, ParseStoredNumber("-", 1));
+}
+
+// The one number reader: atoi's rules within a length, saturating.
+TEST(ParseNumber, ReadsLikeAtoiWithinItsLength)
+{
+    static const struct {
+        const char* text;
+        size_t length;
+        int32_t value;
+    } cases[] = {
+        {"123", 2, 12},           {"  -7", 4, -7},          {"-", 1, 0},           {"+85,100", 7, 85},
+        {"\t\n 60Hz", 7, 60},     {"abc", 3, 0},            {"", 0, 0},            {"-0", 2, 0},
+        {"2147483647", 10, INT32_MAX}, {"2147483648", 10, INT32_MAX}, {"99999999999999999999", 20, INT32_MAX},
+        {"-2147483648", 11, INT32_MIN}, {"-2147483649", 11, INT32_MIN}, {"4294967296", 10, INT32_MAX},
+        {"12\0" "34", 5, 12},
+    };
+    for (const auto& c : cases) EXPECT_EQ(c.value, ParseNumber(c.text, c.length)) << c.text;
 }
 
 TEST_F(SettingsStore, ReadsWhatOtherInstallationsWrote)

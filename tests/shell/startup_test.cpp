@@ -1,6 +1,7 @@
 #include <gtest/gtest.h>
 
 #include "base/state.h"
+#include "base/texts.h"
 #include "shell/main_window.h"
 #include "shell/startup.h"
 #include "shell/tray.h"
@@ -84,10 +85,20 @@ TEST(IniPaths, BesideTheProgramAndCutToTheirBuffers)
     EXPECT_STREQ("C:\\Program Files\\Vistrel\\ZNTR2.INI", text_ini_path);
     EXPECT_STREQ("C:\\Program Files\\Vistrel\\ZNTR3.INI", chip_ini_path);
 
-    std::string deep = "C:\\" + std::string(120, 'd') + "\\vistrel.exe";
-    BuildIniPaths(deep.c_str());
+    // "C:\" + 114 letters + "\ZNTR2.INI" is 127 characters: the longest that fits.
+    std::string longest = "C:\\" + std::string(114, 'd') + "\\vistrel.exe";
+    BuildIniPaths(longest.c_str());
     EXPECT_EQ((size_t)INI_PATH_SIZE - 1, strlen(text_ini_path));
-    EXPECT_EQ(0, strncmp(text_ini_path, deep.c_str(), 100));
+    EXPECT_STREQ("ZNTR3.INI", chip_ini_path + INI_PATH_SIZE - 10);
+    // One more and no file is named at all: the texts fall back to their defaults.
+    std::string deeper = "C:\\" + std::string(115, 'd') + "\\vistrel.exe";
+    BuildIniPaths(deeper.c_str());
+    EXPECT_STREQ("", text_ini_path);
+    EXPECT_STREQ("", chip_ini_path);
+    char text[20];
+    memset(text, '#', sizeof text);
+    LoadText("CAPTION", "Vistrel", text, sizeof text);
+    EXPECT_STREQ("Vistrel", text);
 }
 
 // The test runs under the Windows version CTest asked Wine for.

@@ -5,6 +5,7 @@
 #include <vector>
 
 #include "base/adapters.h"
+#include "base/module_reset.h"
 #include "base/settings.h"
 #include "base/state.h"
 #include "hardware/driver_key.h"
@@ -17,20 +18,7 @@
 
 void ResetProgramState(const std::string& text_ini, const std::string& chip_ini)
 {
-    platform = 0;
-    os_class = 0;
-    startup_flags = 0;
-    instance = GetModuleHandleA(NULL);
-    main_window = NULL;
-    shell_state = 0;
-    last_activity_tick = 0;
-    memset(adapter_table, 0, sizeof adapter_table);
-    adapter_count = 0;
-    current_adapter = 0;
-    monitor_count = 0;
-    driver_handle = NULL;
-    FreeModeTable();
-    ForgetDisplaySettings();
+    ResetAllModules();
     std::string folder = MakeScratchFolder("ini");
     std::string text = text_ini.empty() ? folder + "ZNTR2.INI" : text_ini;
     std::string chip = chip_ini.empty() ? folder + "ZNTR3.INI" : chip_ini;
