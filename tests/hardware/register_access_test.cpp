@@ -1,5 +1,7 @@
 #include <gtest/gtest.h>
 
+#include <string.h>
+
 #include "base/adapters.h"
 #include "base/state.h"
 #include "chips/chips.h"
@@ -8,6 +10,7 @@
 #include "hardware/machine.h"
 #include "hardware/pci.h"
 #include "hardware/register_access.h"
+#include "hardware/registry_text.h"
 #include "modes/detect.h"
 #include "modes/mode_keys.h"
 #include "modes/rate_list.h"
@@ -139,4 +142,24 @@ TEST(ChipCommands, UnknownCodesTouchNothing)
     chip_write_port(0x103D4, 0x10011);  // both cut to 16 bits
     EXPECT_EQ(0x11u, chip_read_port(0x3D4));
     chip_close_io();
+}
+
+// A text exactly as long as its buffer allows is a whole text; one byte
+// more is not cut into a different one.
+TEST(RegistryText, FillsTheBufferExactlyOrNotAtAll)
+{
+    const std::string key = "Software\\VistrelTest\\RegistryText";
+    WriteRegistryString(HKEY_CURRENT_USER, key, "fits", std::string(119, 'f'));
+    WriteRegistryString(HKEY_CURRENT_USER, key, "long", std::string(120, 'l'));
+    WriteRegistryString(HKEY_CURRENT_USER, key, "open", std::string(120, 'o'), false);
+    char text[120];
+    memset(text, '#', sizeof text);
+    EXPECT_EQ(1, ReadRegistryText(HKEY_CURRENT_USER, key.c_str(), "fits", text, sizeof text));
+    EXPECT_EQ(std::string(119, 'f'), text);
+    for (const char* name : {"long", "open", "missing"}) {
+        memset(text, '#', sizeof text);
+        EXPECT_EQ(0, ReadRegistryText(HKEY_CURRENT_USER, key.c_str(), name, text, sizeof text)) << name;
+        EXPECT_STREQ("", text) << name;
+    }
+    DeleteRegistryTree(HKEY_CURRENT_USER, "Software\\VistrelTest");
 }

@@ -19,6 +19,8 @@ TEST(ParseRateList, PositionsAndTheLastItem)
     EXPECT_EQ(0, ParseRateList("60,abc,75", 1));  // not a number: no item
     EXPECT_EQ(72, ParseRateList("60, 72", 1));    // leading blanks as atoi takes them
     EXPECT_EQ(0, ParseRateList("60,72,", RATE_LAST));
+    EXPECT_EQ(0, ParseRateList("60,65596,85", 1));  // beyond 16 bits: not 60 in disguise
+    EXPECT_EQ(65535, ParseRateList("65535", 0));
     EXPECT_EQ(3, CountRateListItems("56,60,72"));
     EXPECT_EQ(0, CountRateListItems(""));
 }
