@@ -1,6 +1,7 @@
 # HookKeep.dll and gatectl.exe, built the same way for both machines.
 # SetKeepHook is stdcall and exported without decoration (--kill-at).
-add_library(HookKeep SHARED ${VISTREL_ROOT}/companions/hookkeep.cpp ${VISTREL_ROOT}/companions/hookkeep.def)
+add_library(HookKeep SHARED ${VISTREL_ROOT}/companions/hookkeep.cpp ${VISTREL_ROOT}/companions/keep_call.cpp
+            ${VISTREL_ROOT}/companions/hookkeep.def)
 set_target_properties(HookKeep PROPERTIES PREFIX "" OUTPUT_NAME HookKeep IMPORT_PREFIX "lib" IMPORT_SUFFIX ".dll.a")
 target_compile_options(HookKeep PRIVATE ${VISTREL_PROGRAM_FLAGS})
 target_link_options(HookKeep PRIVATE -Wl,--kill-at ${VISTREL_COMPANION_LINK_FLAGS})

@@ -12,6 +12,7 @@
 #include "hookkeep.h"
 
 #include "base/protocol.h"
+#include "keep_call.h"
 
 enum { TIMER_COUNT = 3 };
 static const DWORD timer_state[TIMER_COUNT] = {KEEP_STATE_STANDBY, KEEP_STATE_SUSPEND, KEEP_STATE_OFF};
@@ -41,16 +42,26 @@ static HANDLE watch_thread;
 static HANDLE watch_wake;
 static bool watch_stopping;
 static bool hooks_set;  // the shared hook handles are ours, not a dead process's
+static KeepPhase phase;
+static HWND started_for;
 static DWORD minute_ms;
 static DWORD timer_minutes[TIMER_COUNT];
 static DWORD period_start;  // last_input at the start of the idle period being timed
 static DWORD period_entered;  // states posted in this idle period
 static DWORD period_deepest;  // the deepest of them
 
+// A post to no window would land in the queue of whatever thread the hook
+// runs in.
+static void PostState(DWORD state)
+{
+    HWND window = shared.window;
+    if (window) PostMessageA(window, MSG_POWER_STATE, state, 0);
+}
+
 static void NoteInput()
 {
     shared.last_input = GetTickCount();
-    if (InterlockedExchange(&shared.asleep, 0)) PostMessageA(shared.window, MSG_POWER_STATE, 0, 0);
+    if (InterlockedExchange(&shared.asleep, 0)) PostState(0);
 }
 
 // The cursor really moved; Windows also sends WM_MOUSEMOVE when a window
@@ -117,10 +128,9 @@ static void EnterState(DWORD state, DWORD idle_since)
     if (state < period_deepest) return;
     period_deepest = state;
     InterlockedExchange(&shared.asleep, 1);
-    PostMessageA(shared.window, MSG_POWER_STATE, state, 0);
+    PostState(state);
     // Input that came while we decided saw no state to wake from.
-    if (shared.last_input != idle_since && InterlockedExchange(&shared.asleep, 0))
-        PostMessageA(shared.window, MSG_POWER_STATE, 0, 0);
+    if (shared.last_input != idle_since && InterlockedExchange(&shared.asleep, 0)) PostState(0);
 }
 
 // Posts every state whose time has come, in the order they ran out, and
@@ -190,8 +200,9 @@ static void StopWatching()
     hooks_set = false;
     shared.keyboard_hook = NULL;
     shared.mouse_hook = NULL;
-    shared.window = NULL;
+    // Asleep first: a hook that still sees it set posts to the window.
     InterlockedExchange(&shared.asleep, 0);
+    shared.window = NULL;
 }
 
 static DWORD StartWatching(HWND window, DWORD minute_length)
@@ -252,18 +263,24 @@ static DWORD EnterNow(DWORD state)
 
 HOOKKEEP_API DWORD WINAPI SetKeepHook(HWND window, DWORD state, DWORD enable, DWORD minutes)
 {
-    bool watching = watch_thread != NULL;
-    if (window && (!watching || window != shared.window)) return StartWatching(window, minutes);
-    if (!watching) return 0;
-    if (state == KEEP_STATE_ALL) {
-        if (enable || minutes) return 0;
+    switch (ClassifyKeepCall(phase, started_for, window, state, enable, minutes)) {
+    case KEEP_CALL_START:
+        phase = KEEP_STARTED;
+        started_for = window;
+        return StartWatching(window, minutes);
+    case KEEP_CALL_STOP:
+        phase = KEEP_STOPPED;
+        started_for = NULL;
         StopWatching();
         return 1;
+    case KEEP_CALL_ENTER_NOW:
+        return watch_thread ? EnterNow(state) : 0;
+    case KEEP_CALL_ARM:
+        return watch_thread ? ArmTimer(TimerIndex(state), enable, minutes) : 0;
+    case KEEP_CALL_REFUSED:
+        break;
     }
-    int i = TimerIndex(state);
-    if (i < 0) return 0;
-    if (enable && minutes == 0) return EnterNow(state);
-    return ArmTimer(i, enable, minutes);
+    return 0;
 }
 
 BOOL WINAPI DllMain(HINSTANCE inst, DWORD reason, void* reserved)
@@ -275,8 +292,8 @@ BOOL WINAPI DllMain(HINSTANCE inst, DWORD reason, void* reserved)
     } else if (reason == DLL_PROCESS_DETACH && watch_thread) {
         // The process is going without the stop call: its watcher is gone or
         // cannot be waited for here, but the window must not get our posts.
-        shared.window = NULL;
         InterlockedExchange(&shared.asleep, 0);
+        shared.window = NULL;
     }
     return TRUE;
 }

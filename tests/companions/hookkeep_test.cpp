@@ -4,6 +4,7 @@
 #include <gtest/gtest.h>
 
 #include "../../companions/hookkeep.h"
+#include "../../companions/keep_call.h"
 #include "power_window.h"
 #include "shell/main_window.h"
 
@@ -166,6 +167,36 @@ TEST_F(HookKeep, KeyPressInAnotherProcessWakes)
     CloseHandle(process.hProcess);
     CloseHandle(process.hThread);
     CloseHandle(ready);
+}
+
+// The start call and a timer call look alike; after a start that failed, the
+// program's timer calls for the same window must stay timer calls, or a
+// "five-minute" timer call would start watching with a 4.6 ms minute.
+TEST(KeepCalls, TheStartCallIsToldByThePhaseNotByTheWatcher)
+{
+    HWND w = (HWND)0x1234, other = (HWND)0x5678;
+    static const struct {
+        KeepPhase phase;
+        HWND window;
+        DWORD state, enable, minutes;
+        KeepCall call;
+    } cases[] = {
+        {KEEP_STOPPED, w, 1, 1, 65536, KEEP_CALL_START},
+        {KEEP_STARTED, w, 1, 1, 5, KEEP_CALL_ARM},
+        {KEEP_STARTED, other, 1, 1, 65536, KEEP_CALL_START},
+        {KEEP_STARTED, NULL, 2, 1, 10, KEEP_CALL_ARM},
+        {KEEP_STARTED, NULL, 2, 0, 0, KEEP_CALL_ARM},
+        {KEEP_STARTED, NULL, 4, 1, 0, KEEP_CALL_ENTER_NOW},
+        {KEEP_STARTED, NULL, 0, 0, 0, KEEP_CALL_STOP},
+        {KEEP_STARTED, NULL, 0, 1, 0, KEEP_CALL_REFUSED},
+        {KEEP_STARTED, NULL, 0, 0, 3, KEEP_CALL_REFUSED},
+        {KEEP_STARTED, NULL, 3, 1, 5, KEEP_CALL_REFUSED},
+        {KEEP_STOPPED, NULL, 1, 1, 5, KEEP_CALL_REFUSED},
+        {KEEP_STOPPED, NULL, 0, 0, 0, KEEP_CALL_REFUSED},
+    };
+    for (const auto& c : cases)
+        EXPECT_EQ(c.call, ClassifyKeepCall(c.phase, w, c.window, c.state, c.enable, c.minutes))
+            << c.phase << " " << c.window << " " << c.state << "," << c.enable << "," << c.minutes;
 }
 
 }  // namespace
