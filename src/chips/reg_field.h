@@ -33,7 +33,7 @@ struct RegField {
     }
 
     // The largest value the field holds.
-    constexpr uint32_t Highest() const
+    consteval uint32_t Highest() const
     {
         int bits = 0;
         for (int i = 0; i < count; ++i) bits += pieces[i].high - pieces[i].low + 1;

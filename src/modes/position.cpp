@@ -23,12 +23,12 @@ enum : uint8_t {
     CR15_VBLANK_START = 0x15,
 };
 
-static const RegField horizontal_blank_start = {{CR02_HBLANK_START, 0, 7}};
-static const RegField horizontal_retrace_start = {{CR04_HRETRACE_START, 0, 7}};
-static const RegField vertical_blank_start = {{CR15_VBLANK_START, 0, 7}, {CR07_OVERFLOW, 3, 3}, {CR09_MAX_SCAN_LINE, 5, 5}};
-static const RegField vertical_retrace_start = {{CR10_VRETRACE_START, 0, 7}, {CR07_OVERFLOW, 2, 2}, {CR07_OVERFLOW, 7, 7}};
+static constexpr RegField horizontal_blank_start = {{CR02_HBLANK_START, 0, 7}};
+static constexpr RegField horizontal_retrace_start = {{CR04_HRETRACE_START, 0, 7}};
+static constexpr RegField vertical_blank_start = {{CR15_VBLANK_START, 0, 7}, {CR07_OVERFLOW, 3, 3}, {CR09_MAX_SCAN_LINE, 5, 5}};
+static constexpr RegField vertical_retrace_start = {{CR10_VRETRACE_START, 0, 7}, {CR07_OVERFLOW, 2, 2}, {CR07_OVERFLOW, 7, 7}};
 // The stored V value: CR10 and the whole overflow register CR07.
-static const RegField stored_v_registers = {{CR10_VRETRACE_START, 0, 7}, {CR07_OVERFLOW, 0, 7}};
+static constexpr RegField stored_v_registers = {{CR10_VRETRACE_START, 0, 7}, {CR07_OVERFLOW, 0, 7}};
 
 static const uint8_t cr11_write_protect = 0x80;
 

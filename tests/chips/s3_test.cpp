@@ -135,6 +135,8 @@ TEST(S3PixelClock, DoubledAboveEightBits)
     CurrentAdapter()->bits_per_pixel = 16;
     chip_open_io();
     double running = chip_get_pixel_clock();
+    // SR18 reads 0 while the extended sequencer is locked.
+    SimWriteRegister(0, SIM_REG_SEQUENCER, 0x08, 0x00);
     ASSERT_EQ(1u, chip_set_pixel_clock(running * 1.1));
     double read16 = chip_get_pixel_clock();
     chip_close_io();
@@ -144,6 +146,31 @@ TEST(S3PixelClock, DoubledAboveEightBits)
     chip_open_io();
     EXPECT_NEAR(SimPixelClockHz(0), chip_get_pixel_clock(), 1.0);
     chip_close_io();
+}
+
+// Raw synthesizer fields with the bits each layout ignores or adds, read as
+// the model reads them.
+TEST(S3PixelClock, EachLayoutReadsAsTheModel)
+{
+    struct Case {
+        uint16_t id;
+        uint8_t sr12, sr13, sr29;
+    } cases[] = {
+        {0x8901, 0x85, 0xE4, 0x00},  // R = 4; SR13 bit 7 is not M
+        {0x5631, 0xA7, 0x64, 0x00},  // R has two bits: SR12 bit 7 is not R
+        {0x8a20, 0x4A, 0x2C, 0xFB},  // N + 64, M + 256 from SR29
+        {0x8a20, 0x8A, 0x2C, 0xE7},  // R + 4 from SR29
+    };
+    for (const Case& c : cases) {
+        BootS3(c.id);
+        CurrentAdapter()->bits_per_pixel = 8;
+        SimWriteRegister(0, SIM_REG_SEQUENCER, 0x12, c.sr12);
+        SimWriteRegister(0, SIM_REG_SEQUENCER, 0x13, c.sr13);
+        SimWriteRegister(0, SIM_REG_SEQUENCER, 0x29, c.sr29);
+        chip_open_io();
+        EXPECT_NEAR(SimPixelClockHz(0), chip_get_pixel_clock(), 1.0) << std::hex << c.id << " " << (int)c.sr12;
+        chip_close_io();
+    }
 }
 
 TEST(S3Registers, TimingTotalsAsTheModelCountsThem)
@@ -186,6 +213,12 @@ TEST(S3Registers, MemorySizeFromTheStraps)
     // Straps the older chips do not define show no size at all.
     BootS3(0x8901);
     SimWriteRegister(0, SIM_REG_CRTC, 0x36, 0x2E);
+    EXPECT_EQ(0u, chip_get_mem_size());
+    // Nor do registers that cannot be read (a 0 strap would say 4 MB).
+    BootS3(0x8901, SIM_WINDOWS_NT4);
+    SimMachineConfig config = Machine(SIM_WINDOWS_NT4, {Card(0x5333, 0x8901)});
+    config.nt_device = false;
+    SimBoot(&config);
     EXPECT_EQ(0u, chip_get_mem_size());
 }
 

@@ -30,15 +30,20 @@ TEST(SynthesizerSearch, FitAfterStepsDownFromTheCurrentDivider)
     EXPECT_NEAR(78.75e6, SynthFrequency(&trio64v2_dclk, s), 10.0);
 }
 
-TEST(SynthesizerSearch, NoFitWithinTwentyStepsLeavesTheSettingAlone)
+TEST(SynthesizerSearch, TwentyTriesAtMostAndNothingChangedWithoutAFit)
 {
-    // 60 MHz needs a VCO of 120 MHz at R = 1: too low at N = 12, too high at
-    // N = 13, and the search swings between them until it gives up.
-    SynthSetting s = {115, 12, 1};
-    EXPECT_EQ(0, SearchSynthesizer(&mclk, 60e6, &s));
-    EXPECT_EQ(115, s.m);
-    EXPECT_EQ(12, s.n);
-    EXPECT_EQ(1, s.r);
+    // 20 MHz at R = 3 first fits at N = 9, M = 120: the 20th try from N = 28,
+    // one too many from N = 29.
+    SynthSetting s = {7, 28, 3};
+    ASSERT_EQ(1, SearchSynthesizer(&mclk, 20e6, &s));
+    EXPECT_EQ(120, s.m);
+    EXPECT_EQ(9, s.n);
+    EXPECT_EQ(3, s.r);
+    s = {7, 29, 3};
+    EXPECT_EQ(0, SearchSynthesizer(&mclk, 20e6, &s));
+    EXPECT_EQ(7, s.m);
+    EXPECT_EQ(29, s.n);
+    EXPECT_EQ(3, s.r);
 }
 
 TEST(SynthesizerSearch, TooLowATargetWrapsToAHugeMultiplier)
