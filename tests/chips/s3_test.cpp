@@ -158,8 +158,8 @@ TEST(S3PixelClock, EachLayoutReadsAsTheModel)
     } cases[] = {
         {0x8901, 0x85, 0xE4, 0x00},  // R = 4; SR13 bit 7 is not M
         {0x5631, 0xA7, 0x64, 0x00},  // R has two bits: SR12 bit 7 is not R
-        {0x8a20, 0x4A, 0x2C, 0xFB},  // N + 64, M + 256 from SR29
-        {0x8a20, 0x8A, 0x2C, 0xE7},  // R + 4 from SR29
+        {0x8a20, 0x4A, 0x2C, 0xF3},  // SR29 bit 4: N + 64
+        {0x8a20, 0x8A, 0x2C, 0xEC},  // SR29 bits 3 and 2: M + 256, R + 4
     };
     for (const Case& c : cases) {
         BootS3(c.id);
