@@ -14,7 +14,8 @@
 #include "hardware/register_access.h"
 
 // VGA port p lies at 0x8000 + p of the register window.
-static const ChipPortWindow s3_ports = {.windowed = true, .low_first = 1, .low_last = 0, .low_offset = 0, .offset = 0x8000};
+static const ChipPortWindow s3_ports = {
+    .windowed = true, .low_first = 1, .low_last = 0, .low_offset = 0, .offset = 0x8000};
 static const RegisterWindowPlace s3_window = {.config_offset = 0x10, .mask = 0xFC000000u, .added = 0x01000000u};
 static const RegisterWindowPlace savage3d_window = {.config_offset = 0x10, .mask = 0xF8000000u, .added = 0x01000000u};
 
@@ -49,8 +50,10 @@ static const uint8_t cr43_double_horizontal = 0x80;
 static const uint8_t sr0d_sync_mask = 0xF0;
 
 static const RegField horizontal_total = {{CR00_HTOTAL, 0, 7}, {CR5D_EXT_HORZ, 0, 0}};
-static const RegField savage3d_horizontal_total = {{CR00_HTOTAL, 0, 7}, {CR5D_EXT_HORZ, 0, 0}, {CR5F_SAVAGE_HORZ, 0, 1}};
-static const RegField vertical_total = {{CR06_VTOTAL, 0, 7}, {CR07_OVERFLOW, 0, 0}, {CR07_OVERFLOW, 5, 5}, {CR5E_EXT_VERT, 0, 0}};
+static const RegField savage3d_horizontal_total = {
+    {CR00_HTOTAL, 0, 7}, {CR5D_EXT_HORZ, 0, 0}, {CR5F_SAVAGE_HORZ, 0, 1}};
+static const RegField vertical_total = {
+    {CR06_VTOTAL, 0, 7}, {CR07_OVERFLOW, 0, 0}, {CR07_OVERFLOW, 5, 5}, {CR5E_EXT_VERT, 0, 0}};
 
 // A synthesizer's M, N and R in the sequencer, and how a new setting is
 // written: bits of `cleared` go to 0 with it, the registers of `first` lead.
@@ -101,20 +104,20 @@ static const S3MemoryStraps virge_vx_memory = {.straps = {{CR36_CONFIG1, 5, 6}},
 static const S3MemoryStraps standard_memory = {.straps = {{CR36_CONFIG1, 5, 7}}, .mb = standard_memory_mb};
 
 // Pixel clock synthesizer limits: a = b = 2, M from 1, R from 0.
-static const SynthLimits savage3d_dclk = {.fref_hz = reference_crystal_hz, .a = 2, .b = 2, .m_min = 1, .m_max = 511,
+static constexpr SynthLimits savage3d_dclk = {.fref_hz = reference_crystal_hz, .a = 2, .b = 2, .m_min = 1, .m_max = 511,
                                           .n_min = 1, .n_max = 127, .r_min = 0, .r_max = 4,
                                           .vco_min_hz = 220e6, .vco_max_hz = 550e6};
-static const SynthLimits virge_vx_dclk = {.fref_hz = reference_crystal_hz, .a = 2, .b = 2, .m_min = 1, .m_max = 127,
+static constexpr SynthLimits virge_vx_dclk = {.fref_hz = reference_crystal_hz, .a = 2, .b = 2, .m_min = 1, .m_max = 127,
                                           .n_min = 0, .n_max = 31, .r_min = 0, .r_max = 4,
                                           .vco_min_hz = 220e6, .vco_max_hz = 440e6};
-static const SynthLimits newer_dclk = {.fref_hz = reference_crystal_hz, .a = 2, .b = 2, .m_min = 1, .m_max = 127,
+static constexpr SynthLimits newer_dclk = {.fref_hz = reference_crystal_hz, .a = 2, .b = 2, .m_min = 1, .m_max = 127,
                                        .n_min = 1, .n_max = 31, .r_min = 0, .r_max = 4,
                                        .vco_min_hz = 140e6, .vco_max_hz = 340e6};
-static const SynthLimits older_dclk = {.fref_hz = reference_crystal_hz, .a = 2, .b = 2, .m_min = 1, .m_max = 127,
+static constexpr SynthLimits older_dclk = {.fref_hz = reference_crystal_hz, .a = 2, .b = 2, .m_min = 1, .m_max = 127,
                                        .n_min = 1, .n_max = 31, .r_min = 0, .r_max = 3,
                                        .vco_min_hz = 135e6, .vco_max_hz = 270e6};
 // The memory clock has the same limits on every chip.
-static const SynthLimits s3_mclk_limits = older_dclk;
+static constexpr SynthLimits s3_mclk_limits = older_dclk;
 
 // What tells the S3 chips apart; a row names only what differs from the
 // older chips' defaults.

@@ -12,7 +12,6 @@
 
 int adjust_offset_h, adjust_offset_v;
 
-
 enum : uint8_t {
     CR02_HBLANK_START = 0x02,
     CR04_HRETRACE_START = 0x04,
@@ -25,13 +24,14 @@ enum : uint8_t {
 
 static constexpr RegField horizontal_blank_start = {{CR02_HBLANK_START, 0, 7}};
 static constexpr RegField horizontal_retrace_start = {{CR04_HRETRACE_START, 0, 7}};
-static constexpr RegField vertical_blank_start = {{CR15_VBLANK_START, 0, 7}, {CR07_OVERFLOW, 3, 3}, {CR09_MAX_SCAN_LINE, 5, 5}};
-static constexpr RegField vertical_retrace_start = {{CR10_VRETRACE_START, 0, 7}, {CR07_OVERFLOW, 2, 2}, {CR07_OVERFLOW, 7, 7}};
+static constexpr RegField vertical_blank_start = {
+    {CR15_VBLANK_START, 0, 7}, {CR07_OVERFLOW, 3, 3}, {CR09_MAX_SCAN_LINE, 5, 5}};
+static constexpr RegField vertical_retrace_start = {
+    {CR10_VRETRACE_START, 0, 7}, {CR07_OVERFLOW, 2, 2}, {CR07_OVERFLOW, 7, 7}};
 // The stored V value: CR10 and the whole overflow register CR07.
 static constexpr RegField stored_v_registers = {{CR10_VRETRACE_START, 0, 7}, {CR07_OVERFLOW, 0, 7}};
 
 static const uint8_t cr11_write_protect = 0x80;
-
 
 static uint8_t ReadCrtc(uint8_t index)
 {
@@ -197,7 +197,8 @@ int RestorePosition()
     if (h < 1 && v < 1) return 1;
     if (!chip_open_io()) return 1;
     uint8_t cr11 = UnlockCrtc();
-    if (h >= 1 && h <= (int32_t)horizontal_retrace_start.Highest()) WriteField(&crtc, &horizontal_retrace_start, (uint32_t)h);
+    if (h >= 1 && h <= (int32_t)horizontal_retrace_start.Highest())
+        WriteField(&crtc, &horizontal_retrace_start, (uint32_t)h);
     if (v >= 1 && v <= (int32_t)stored_v_registers.Highest()) {
         // Only the retrace start's bits of the stored CR07: the others stay as the mode set them.
         restored_v = (uint32_t)v;

@@ -11,19 +11,22 @@
 static uint8_t file[256];
 static std::string accesses;
 
+static void Log(const char* format, int index, int value = 0)
+{
+    char line[12];
+    snprintf(line, sizeof line, format, index, value);
+    accesses += line;
+}
+
 static uint8_t Read(uint8_t index)
 {
-    char line[8];
-    snprintf(line, sizeof line, " r%02X", index);
-    accesses += line;
+    Log(" r%02X", index);
     return file[index];
 }
 
 static void Write(uint8_t index, uint8_t value)
 {
-    char line[12];
-    snprintf(line, sizeof line, " w%02X=%02X", index, value);
-    accesses += line;
+    Log(" w%02X=%02X", index, value);
     file[index] = value;
 }
 

@@ -15,8 +15,6 @@
 #include "support/machine.h"
 #include "support/support.h"
 
-static const uint16_t s3_ids[] = {0x8a13, 0x8a20, 0x8a21, 0x8904, 0x5631, 0x883d, 0x8a01, 0x8a10, 0x8811, 0x8901};
-
 static void BootS3(uint16_t device_id, int windows = SIM_WINDOWS_98, uint8_t bus = 0)
 {
     BootMachine(Machine(windows, {Card(0x5333, device_id, bus, bus ? 0 : 10)}));
@@ -84,6 +82,10 @@ TEST(S3PixelClock, EveryChipLandsJustBelowTheTargetInsideItsWindow)
     for (const VcoWindow& w : windows) {
         BootS3(w.id);
         bool doubled = CurrentAdapter()->bits_per_pixel != 8 && (SimReadRegister(0, SIM_REG_SEQUENCER, 0x18) & 0x80);
+        // Beside the fields SR13 bit 7 is kept, and SR12 bit 7 of the chips with a two-bit R cleared.
+        bool savage = w.id == 0x8a20 || w.id == 0x8a21, r2 = w.id == 0x5631 || w.id == 0x8811;
+        if (!savage) SimWriteRegister(0, SIM_REG_SEQUENCER, 0x13, SimReadRegister(0, SIM_REG_SEQUENCER, 0x13) | 0x80);
+        if (r2) SimWriteRegister(0, SIM_REG_SEQUENCER, 0x12, SimReadRegister(0, SIM_REG_SEQUENCER, 0x12) | 0x80);
         chip_open_io();
         double running = chip_get_pixel_clock();
         chip_close_io();
@@ -94,6 +96,8 @@ TEST(S3PixelClock, EveryChipLandsJustBelowTheTargetInsideItsWindow)
             double read = chip_get_pixel_clock();
             chip_close_io();
             ASSERT_EQ(1u, ok) << std::hex << w.id << std::dec << " " << target;
+            if (!savage) EXPECT_EQ(0x80, SimReadRegister(0, SIM_REG_SEQUENCER, 0x13) & 0x80);
+            if (r2) EXPECT_EQ(0, SimReadRegister(0, SIM_REG_SEQUENCER, 0x12) & 0x80);
             int n, r;
             DecodeDclk(w.id, &n, &r);
             double out = SimPixelClockHz(0);
@@ -175,11 +179,11 @@ TEST(S3PixelClock, EachLayoutReadsAsTheModel)
 
 TEST(S3Registers, TimingTotalsAsTheModelCountsThem)
 {
-    for (uint16_t id : s3_ids) {
-        BootS3(id);
+    for (const VcoWindow& w : windows) {
+        BootS3(w.id);
         chip_open_io();
-        EXPECT_EQ((uint32_t)SimHTotal(0), chip_get_htotal()) << std::hex << id;
-        EXPECT_EQ((uint32_t)SimVTotal(0), chip_get_vtotal()) << std::hex << id;
+        EXPECT_EQ((uint32_t)SimHTotal(0), chip_get_htotal()) << std::hex << w.id;
+        EXPECT_EQ((uint32_t)SimVTotal(0), chip_get_vtotal()) << std::hex << w.id;
         chip_close_io();
     }
     BootS3(0x8a20);
@@ -210,6 +214,9 @@ TEST(S3Registers, MemorySizeFromTheStraps)
         ASSERT_EQ(1, DetectAdapters());
         EXPECT_EQ(c.mb << 16, chip_get_mem_size()) << std::hex << c.id << " " << std::dec << c.mb;
     }
+    BootS3(0x883d);
+    SimWriteRegister(0, SIM_REG_CRTC, 0x36, 0xC0);  // bit 7 is not the ViRGE/VX's
+    EXPECT_EQ(6u << 16, chip_get_mem_size());
     // Straps the older chips do not define show no size at all.
     BootS3(0x8901);
     SimWriteRegister(0, SIM_REG_CRTC, 0x36, 0x2E);
