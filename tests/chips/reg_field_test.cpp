@@ -57,6 +57,7 @@ TEST(RegField, WritesEachRegisterOnceKeepingTheOtherBits)
         {"a cleared bit makes the write whole", {{&n5, 3}, {&r2, 3}, {&bit7, 0}}, 3, nullptr, " w12=63", {3, 3, 0}},
         {"a register named first leads", {{&m9, 300}, {&n7, 70}, {&r3_high, 1}}, 3, sr29_first,
          " r29 w29=B9 w13=2C w12=46", {300, 70, 1}},
+        {"a register named first but in no field is left alone", {{&m7, 1}}, 1, sr29_first, " r13 w13=81", {1}},
     };
     for (const Case& c : cases) {
         memset(file, 0xA5, sizeof file);
