@@ -7,30 +7,32 @@
 #include "chips/s3.h"
 #include "chips/unsupported.h"
 
-#define S3_FAMILY S3Dispatch, S3SetPixelClock, S3GetPixelClock
-#define UNSUPPORTED_FAMILY UnsupportedDispatch, UnsupportedSetPixelClock, UnsupportedGetPixelClock
+#define S3_FAMILY .Dispatch = S3Dispatch, .SetPixelClock = S3SetPixelClock, .GetPixelClock = S3GetPixelClock
+#define UNSUPPORTED_FAMILY                                                            \
+    .Dispatch = UnsupportedDispatch, .SetPixelClock = UnsupportedSetPixelClock, \
+    .GetPixelClock = UnsupportedGetPixelClock
 
 const ChipRow chip_table[CHIP_TABLE_ROWS] = {
-    {0x12d2, 0x0018, UNSUPPORTED_FAMILY},  // Riva 128
-    {0x12d2, 0x0019, UNSUPPORTED_FAMILY},  // Riva 128ZX
-    {0x10de, 0x0020, UNSUPPORTED_FAMILY},  // Riva TNT
-    {0x8086, 0x7800, UNSUPPORTED_FAMILY},  // i740
-    {0x121a, 0x0003, UNSUPPORTED_FAMILY},  // Voodoo Banshee
-    {0x1023, 0x939a, UNSUPPORTED_FAMILY},  // Trident 939a
-    {0x5333, 0x8a13, S3_FAMILY},           // Trio3D/2X
-    {0x5333, 0x8a20, S3_FAMILY},           // Savage3D
-    {0x5333, 0x8a21, S3_FAMILY},           // Savage3D/MV
-    {0x5333, 0x8904, S3_FAMILY},           // Trio3D
-    {0x5333, 0x5631, S3_FAMILY},           // ViRGE
-    {0x5333, 0x883d, S3_FAMILY},           // ViRGE/VX
-    {0x5333, 0x8a01, S3_FAMILY},           // ViRGE/DX or GX
-    {0x5333, 0x8a10, S3_FAMILY},           // ViRGE/GX2
-    {0x5333, 0x8811, S3_FAMILY},           // Trio32/Trio64
-    {0x5333, 0x8901, S3_FAMILY},           // Trio64V2
-    {0x104c, 0x3d07, UNSUPPORTED_FAMILY},  // TI Permedia 2
-    {0x3d3d, 0x0007, UNSUPPORTED_FAMILY},  // Permedia 2
-    {0x3d3d, 0x0009, UNSUPPORTED_FAMILY},  // Permedia 2v
-    {0x100c, 0x3208, UNSUPPORTED_FAMILY},  // ET6000
+    {.vendor_id = 0x12d2, .device_id = 0x0018, UNSUPPORTED_FAMILY},  // Riva 128
+    {.vendor_id = 0x12d2, .device_id = 0x0019, UNSUPPORTED_FAMILY},  // Riva 128ZX
+    {.vendor_id = 0x10de, .device_id = 0x0020, UNSUPPORTED_FAMILY},  // Riva TNT
+    {.vendor_id = 0x8086, .device_id = 0x7800, UNSUPPORTED_FAMILY},  // i740
+    {.vendor_id = 0x121a, .device_id = 0x0003, UNSUPPORTED_FAMILY},  // Voodoo Banshee
+    {.vendor_id = 0x1023, .device_id = 0x939a, UNSUPPORTED_FAMILY},  // Trident 939a
+    {.vendor_id = 0x5333, .device_id = 0x8a13, S3_FAMILY},           // Trio3D/2X
+    {.vendor_id = 0x5333, .device_id = 0x8a20, S3_FAMILY},           // Savage3D
+    {.vendor_id = 0x5333, .device_id = 0x8a21, S3_FAMILY},           // Savage3D/MV
+    {.vendor_id = 0x5333, .device_id = 0x8904, S3_FAMILY},           // Trio3D
+    {.vendor_id = 0x5333, .device_id = 0x5631, S3_FAMILY},           // ViRGE
+    {.vendor_id = 0x5333, .device_id = 0x883d, S3_FAMILY},           // ViRGE/VX
+    {.vendor_id = 0x5333, .device_id = 0x8a01, S3_FAMILY},           // ViRGE/DX or GX
+    {.vendor_id = 0x5333, .device_id = 0x8a10, S3_FAMILY},           // ViRGE/GX2
+    {.vendor_id = 0x5333, .device_id = 0x8811, S3_FAMILY},           // Trio32/Trio64
+    {.vendor_id = 0x5333, .device_id = 0x8901, S3_FAMILY},           // Trio64V2
+    {.vendor_id = 0x104c, .device_id = 0x3d07, UNSUPPORTED_FAMILY},  // TI Permedia 2
+    {.vendor_id = 0x3d3d, .device_id = 0x0007, UNSUPPORTED_FAMILY},  // Permedia 2
+    {.vendor_id = 0x3d3d, .device_id = 0x0009, UNSUPPORTED_FAMILY},  // Permedia 2v
+    {.vendor_id = 0x100c, .device_id = 0x3208, UNSUPPORTED_FAMILY},  // ET6000
 };
 
 static const ChipRow* CurrentRow() { return &chip_table[CurrentAdapter()->chip_row]; }

@@ -8,14 +8,16 @@
 #include "base/state.h"
 #include "chips/chip_io.h"
 #include "chips/chips.h"
+#include "chips/reg_field.h"
 #include "chips/s3.h"
 #include "chips/synth.h"
 #include "hardware/register_access.h"
 
 // VGA port p lies at 0x8000 + p of the register window.
-static const ChipPortWindow s3_ports = {true, 1, 0, 0, 0x8000};
-static const RegisterWindowPlace s3_window = {0x10, 0xFC000000u, 0x01000000u};
-static const RegisterWindowPlace savage3d_window = {0x10, 0xF8000000u, 0x01000000u};
+static const ChipPortWindow s3_ports = {
+    .windowed = true, .low_first = 1, .low_last = 0, .low_offset = 0, .offset = 0x8000};
+static const RegisterWindowPlace s3_window = {.config_offset = 0x10, .mask = 0xFC000000u, .added = 0x01000000u};
+static const RegisterWindowPlace savage3d_window = {.config_offset = 0x10, .mask = 0xF8000000u, .added = 0x01000000u};
 
 enum : uint8_t {
     SR01_CLOCKING = 0x01,
@@ -46,45 +48,107 @@ static const uint8_t cr37_agp = 0x40;
 static const uint8_t cr42_interlaced = 0x20;
 static const uint8_t cr43_double_horizontal = 0x80;
 static const uint8_t sr0d_sync_mask = 0xF0;
-static const uint8_t sr29_kept = 0xE3;
 
-// How the DCLK synthesizer fields are packed into SR12 (and SR29).
-enum S3ClockLayout {
-    CLOCK_R_3BITS,    // SR12: N 4..0, R 7..5
-    CLOCK_R_2BITS,    // SR12: N 4..0, R 6..5
-    CLOCK_SAVAGE3D,   // SR12: N 5..0, R 7..6; SR13 all M; high bits in SR29
+static const RegField horizontal_total = {{CR00_HTOTAL, 0, 7}, {CR5D_EXT_HORZ, 0, 0}};
+static const RegField savage3d_horizontal_total = {
+    {CR00_HTOTAL, 0, 7}, {CR5D_EXT_HORZ, 0, 0}, {CR5F_SAVAGE_HORZ, 0, 1}};
+static const RegField vertical_total = {
+    {CR06_VTOTAL, 0, 7}, {CR07_OVERFLOW, 0, 0}, {CR07_OVERFLOW, 5, 5}, {CR5E_EXT_VERT, 0, 0}};
+
+// A synthesizer's M, N and R in the sequencer, and how a new setting is
+// written: bits of `cleared` go to 0 with it, the registers of `first` lead.
+struct S3ClockFields {
+    RegField m, n, r;
+    RegField cleared = {};
+    uint8_t first[1] = {};
+    uint8_t first_count = 0;
+    bool screen_off = false;  // blanks the screen while the fields disagree
 };
 
-// Memory straps in CR36 bits 7..5, decoded per chip.
-enum S3MemoryCode { MEMORY_SAVAGE3D, MEMORY_VIRGE_VX, MEMORY_STANDARD };
+static const S3ClockFields s3_mclk = {
+    .m = {{SR11_MCLK_M, 0, 6}},
+    .n = {{SR10_MCLK_NR, 0, 4}},
+    .r = {{SR10_MCLK_NR, 5, 6}},
+};
+static const S3ClockFields dclk_r_3bits = {
+    .m = {{SR13_DCLK_M, 0, 6}},
+    .n = {{SR12_DCLK_NR, 0, 4}},
+    .r = {{SR12_DCLK_NR, 5, 7}},
+};
+// ViRGE and Trio32/64: SR12 is written whole, bit 7 clear.
+static const S3ClockFields dclk_r_2bits = {
+    .m = {{SR13_DCLK_M, 0, 6}},
+    .n = {{SR12_DCLK_NR, 0, 4}},
+    .r = {{SR12_DCLK_NR, 5, 6}},
+    .cleared = {{SR12_DCLK_NR, 7, 7}},
+};
+static const S3ClockFields dclk_savage3d = {
+    .m = {{SR13_DCLK_M, 0, 7}, {SR29_DCLK_HIGH, 3, 3}},
+    .n = {{SR12_DCLK_NR, 0, 5}, {SR29_DCLK_HIGH, 4, 4}},
+    .r = {{SR12_DCLK_NR, 6, 7}, {SR29_DCLK_HIGH, 2, 2}},
+    .first = {SR29_DCLK_HIGH},
+    .first_count = 1,
+    .screen_off = true,
+};
 
+// The memory straps in CR36 and the megabytes of each value.
+struct S3MemoryStraps {
+    RegField straps;
+    const uint8_t* mb;
+};
+static const uint8_t savage3d_memory_mb[4] = {8, 4, 4, 2};
+static const uint8_t virge_vx_memory_mb[4] = {2, 4, 6, 8};
+static const uint8_t standard_memory_mb[8] = {4, 0, 4, 0, 2, 0, 1, 0};
+static const S3MemoryStraps savage3d_memory = {.straps = {{CR36_CONFIG1, 6, 7}}, .mb = savage3d_memory_mb};
+static const S3MemoryStraps virge_vx_memory = {.straps = {{CR36_CONFIG1, 5, 6}}, .mb = virge_vx_memory_mb};
+static const S3MemoryStraps standard_memory = {.straps = {{CR36_CONFIG1, 5, 7}}, .mb = standard_memory_mb};
+
+// Pixel clock synthesizer limits: a = b = 2, M from 1, R from 0.
+static constexpr SynthLimits savage3d_dclk = {.fref_hz = reference_crystal_hz, .a = 2, .b = 2, .m_min = 1, .m_max = 511,
+                                          .n_min = 1, .n_max = 127, .r_min = 0, .r_max = 4,
+                                          .vco_min_hz = 220e6, .vco_max_hz = 550e6};
+static constexpr SynthLimits virge_vx_dclk = {.fref_hz = reference_crystal_hz, .a = 2, .b = 2, .m_min = 1, .m_max = 127,
+                                          .n_min = 0, .n_max = 31, .r_min = 0, .r_max = 4,
+                                          .vco_min_hz = 220e6, .vco_max_hz = 440e6};
+static constexpr SynthLimits newer_dclk = {.fref_hz = reference_crystal_hz, .a = 2, .b = 2, .m_min = 1, .m_max = 127,
+                                       .n_min = 1, .n_max = 31, .r_min = 0, .r_max = 4,
+                                       .vco_min_hz = 140e6, .vco_max_hz = 340e6};
+static constexpr SynthLimits older_dclk = {.fref_hz = reference_crystal_hz, .a = 2, .b = 2, .m_min = 1, .m_max = 127,
+                                       .n_min = 1, .n_max = 31, .r_min = 0, .r_max = 3,
+                                       .vco_min_hz = 135e6, .vco_max_hz = 270e6};
+// The memory clock has the same limits on every chip.
+static constexpr SynthLimits s3_mclk_limits = older_dclk;
+
+// What tells the S3 chips apart; a row names only what differs from the
+// older chips' defaults.
 struct S3Chip {
     uint16_t device_id;
-    double vco_min_mhz, vco_max_mhz;
-    uint16_t m_max, n_min, n_max, r_max;
-    uint32_t init_result;
-    uint32_t agp_rate;
-    S3ClockLayout layout;
-    S3MemoryCode memory;
+    const SynthLimits* dclk_limits = &older_dclk;
+    const S3ClockFields* dclk = &dclk_r_3bits;
+    const RegField* htotal = &horizontal_total;
+    const S3MemoryStraps* memory = &standard_memory;
+    const RegisterWindowPlace* window = &s3_window;
+    uint32_t init_result = 0;
+    bool agp_strap = false;  // on Windows 9x CR37 tells an AGP card
+    uint32_t agp_rate = 0;
 };
 
 static const S3Chip s3_chips[] = {
-    {0x8a20, 220, 550, 511, 1, 127, 4, 0, 2, CLOCK_SAVAGE3D, MEMORY_SAVAGE3D},
-    {0x8a21, 220, 550, 511, 1, 127, 4, 0, 2, CLOCK_SAVAGE3D, MEMORY_SAVAGE3D},
-    {0x883d, 220, 440, 127, 0, 31, 4, 0, 0, CLOCK_R_3BITS, MEMORY_VIRGE_VX},
-    {0x8901, 140, 340, 127, 1, 31, 4, 0, 0, CLOCK_R_3BITS, MEMORY_STANDARD},
-    {0x8a01, 140, 340, 127, 1, 31, 4, 0, 0, CLOCK_R_3BITS, MEMORY_STANDARD},
-    {0x8a10, 140, 340, 127, 1, 31, 4, 0, 1, CLOCK_R_3BITS, MEMORY_STANDARD},
-    {0x8904, 140, 340, 127, 1, 31, 4, 0, 1, CLOCK_R_3BITS, MEMORY_STANDARD},
-    {0x8a13, 135, 270, 127, 1, 31, 3, CHIP_CAP_NO_CLOCK_REFRESH, 2, CLOCK_R_3BITS, MEMORY_STANDARD},
-    {0x5631, 135, 270, 127, 1, 31, 3, 0, 0, CLOCK_R_2BITS, MEMORY_STANDARD},
-    {0x8811, 135, 270, 127, 1, 31, 3, 0, 0, CLOCK_R_2BITS, MEMORY_STANDARD},
+    {.device_id = 0x8a20, .dclk_limits = &savage3d_dclk, .dclk = &dclk_savage3d, .htotal = &savage3d_horizontal_total,
+     .memory = &savage3d_memory, .window = &savage3d_window, .agp_strap = true, .agp_rate = 2},
+    {.device_id = 0x8a21, .dclk_limits = &savage3d_dclk, .dclk = &dclk_savage3d, .htotal = &savage3d_horizontal_total,
+     .memory = &savage3d_memory, .window = &savage3d_window, .agp_strap = true, .agp_rate = 2},
+    {.device_id = 0x883d, .dclk_limits = &virge_vx_dclk, .memory = &virge_vx_memory},
+    {.device_id = 0x8901, .dclk_limits = &newer_dclk},
+    {.device_id = 0x8a01, .dclk_limits = &newer_dclk},
+    {.device_id = 0x8a10, .dclk_limits = &newer_dclk, .agp_rate = 1},
+    {.device_id = 0x8904, .dclk_limits = &newer_dclk, .agp_rate = 1},
+    {.device_id = 0x8a13, .init_result = CHIP_CAP_NO_CLOCK_REFRESH, .agp_rate = 2},
+    {.device_id = 0x5631, .dclk = &dclk_r_2bits},
+    {.device_id = 0x8811, .dclk = &dclk_r_2bits},
 };
-// Any other S3 id: the older chips' limits.
-static const S3Chip s3_other_chip = {0, 135, 270, 127, 1, 31, 3, 0, 0, CLOCK_R_3BITS, MEMORY_STANDARD};
-
-// The memory clock has fixed limits on every chip: VCO 135 to 270 MHz.
-static const SynthLimits s3_mclk_limits = {14.31818, 2, 2, 1, 127, 1, 31, 0, 3, 135.0, 270.0};
+// Any other S3 id: the older chips.
+static const S3Chip s3_other_chip = {.device_id = 0};
 
 // DPMS sync control values of SR0D bits 7..4, by command code.
 struct S3DpmsState {
@@ -92,19 +156,14 @@ struct S3DpmsState {
     uint8_t sync_bits;
 };
 static const S3DpmsState s3_dpms_states[] = {
-    {CMD_DPMS_ON, 0x00},       // both syncs running
-    {CMD_DPMS_STANDBY, 0x20},  // horizontal sync off
-    {CMD_DPMS_SUSPEND, 0x80},  // vertical sync off
-    {CMD_DPMS_OFF, 0xA0},      // both off
+    {.command = CMD_DPMS_ON, .sync_bits = 0x00},       // both syncs running
+    {.command = CMD_DPMS_STANDBY, .sync_bits = 0x20},  // horizontal sync off
+    {.command = CMD_DPMS_SUSPEND, .sync_bits = 0x80},  // vertical sync off
+    {.command = CMD_DPMS_OFF, .sync_bits = 0xA0},      // both off
 };
 
-// Megabytes per CR36 strap value.
-static const uint8_t savage3d_memory_mb[4] = {8, 4, 4, 2};
-static const uint8_t virge_vx_memory_mb[4] = {2, 4, 6, 8};
-static const uint8_t standard_memory_mb[8] = {4, 0, 4, 0, 2, 0, 1, 0};
-
 // Pixel clock limits loaded by CMD_INIT_CHIP, shared by every S3 adapter.
-static SynthLimits s3_dclk_limits = {reference_crystal_hz, 2, 2, 1, 127, 1, 31, 0, 3, 135e6, 270e6};
+static const SynthLimits* s3_dclk_limits = &older_dclk;
 
 static const S3Chip* CurrentChip()
 {
@@ -117,6 +176,9 @@ static const S3Chip* CurrentChip()
 static uint8_t ReadSeq(uint8_t index) { return ChipReadIndexed(&s3_ports, VGA_SEQ_INDEX, index); }
 static void WriteSeq(uint8_t index, uint8_t value) { ChipWriteIndexed(&s3_ports, VGA_SEQ_INDEX, index, value); }
 static uint8_t ReadCrtc(uint8_t index) { return ChipReadIndexed(&s3_ports, VGA_CRTC_INDEX, index); }
+static void WriteCrtc(uint8_t index, uint8_t value) { ChipWriteIndexed(&s3_ports, VGA_CRTC_INDEX, index, value); }
+static const RegAccess s3_sequencer = {.read = ReadSeq, .write = WriteSeq};
+static const RegAccess s3_crtc = {.read = ReadCrtc, .write = WriteCrtc};
 
 // SR08 = 0x06 opens the extended sequencer registers SR09 and above.
 static void UnlockExtendedSequencer() { WriteSeq(SR08_UNLOCK, sr08_unlock_key); }
@@ -136,13 +198,8 @@ static uint32_t SetDpms(uint32_t command)
 static uint32_t InitChip()
 {
     const S3Chip* chip = CurrentChip();
-    s3_dclk_limits.m_max = chip->m_max;
-    s3_dclk_limits.n_min = chip->n_min;
-    s3_dclk_limits.n_max = chip->n_max;
-    s3_dclk_limits.r_max = chip->r_max;
-    s3_dclk_limits.vco_min = chip->vco_min_mhz * 1e6;
-    s3_dclk_limits.vco_max = chip->vco_max_mhz * 1e6;
-    if (chip->layout == CLOCK_SAVAGE3D && platform == PLATFORM_9X) {
+    s3_dclk_limits = chip->dclk_limits;
+    if (chip->agp_strap && platform == PLATFORM_9X) {
         OpenRegisterAccess();
         uint8_t cr37 = ReadCrtc(CR37_CONFIG2);
         CloseRegisterAccess();
@@ -153,18 +210,12 @@ static uint32_t InitChip()
 
 static uint32_t HorizontalTotal()
 {
-    uint32_t t = ReadCrtc(CR00_HTOTAL) + 256u * (ReadCrtc(CR5D_EXT_HORZ) & 1);
-    if (CurrentChip()->layout == CLOCK_SAVAGE3D) t += 512u * (ReadCrtc(CR5F_SAVAGE_HORZ) & 3);
+    uint32_t t = ReadField(&s3_crtc, CurrentChip()->htotal);
     if (ReadCrtc(CR43_EXT_MODE) & cr43_double_horizontal) t *= 2;
     return t + 5;
 }
 
-static uint32_t VerticalTotal()
-{
-    uint8_t overflow = ReadCrtc(CR07_OVERFLOW);
-    return ReadCrtc(CR06_VTOTAL) + 256u * (overflow & 1) + 512u * ((overflow >> 5) & 1) +
-           1024u * (ReadCrtc(CR5E_EXT_VERT) & 1) + 2;
-}
+static uint32_t VerticalTotal() { return ReadField(&s3_crtc, &vertical_total) + 2; }
 
 static uint32_t CharacterWidth()
 {
@@ -174,16 +225,12 @@ static uint32_t CharacterWidth()
 
 static uint32_t MemorySize()
 {
-    OpenRegisterAccess();
-    uint8_t straps = (uint8_t)(ReadCrtc(CR36_CONFIG1) >> 5);
+    // Without register access CR36 reads 0, which would pass for a size.
+    if (!OpenRegisterAccess()) return 0;
+    const S3MemoryStraps* memory = CurrentChip()->memory;
+    uint32_t straps = ReadField(&s3_crtc, &memory->straps);
     CloseRegisterAccess();
-    uint32_t mb;
-    switch (CurrentChip()->memory) {
-    case MEMORY_SAVAGE3D: mb = savage3d_memory_mb[(straps & 6) >> 1]; break;
-    case MEMORY_VIRGE_VX: mb = virge_vx_memory_mb[straps & 3]; break;
-    default: mb = standard_memory_mb[straps & 7]; break;
-    }
-    return mb << 16;
+    return (uint32_t)memory->mb[straps] << 16;
 }
 
 // The 9x display driver takes the refresh rate from its mode key.
@@ -197,36 +244,49 @@ static uint32_t IsInterlaced()
     return (mode & cr42_interlaced) ? 1 : 0;
 }
 
-static SynthSetting ReadMemoryClockFields()
+// The extended sequencer must be unlocked.
+static SynthSetting ReadClock(const S3ClockFields* f)
 {
-    UnlockExtendedSequencer();
-    uint8_t sr10 = ReadSeq(SR10_MCLK_NR);
-    SynthSetting s = {(uint16_t)(ReadSeq(SR11_MCLK_M) & 0x7F), (uint16_t)(sr10 & 0x1F), (uint16_t)((sr10 >> 5) & 3)};
-    return s;
+    return {.m = (uint16_t)ReadField(&s3_sequencer, &f->m),
+            .n = (uint16_t)ReadField(&s3_sequencer, &f->n),
+            .r = (uint16_t)ReadField(&s3_sequencer, &f->r)};
 }
+
+// Writes a setting found by the search, each register once.
+static void CommitClock(const S3ClockFields* f, SynthSetting s)
+{
+    const RegFieldValue values[] = {
+        {.field = &f->m, .value = s.m}, {.field = &f->n, .value = s.n},
+        {.field = &f->r, .value = s.r}, {.field = &f->cleared, .value = 0}};
+    UnlockExtendedSequencer();
+    uint8_t clocking = f->screen_off ? ReadSeq(SR01_CLOCKING) : 0;
+    // SR01 bit 5 turns the screen off while the synthesizer fields disagree.
+    if (f->screen_off) WriteSeq(SR01_CLOCKING, (uint8_t)(clocking | sr01_screen_off));
+    WriteFields(&s3_sequencer, values, 4, f->first, f->first_count);
+    if (f->screen_off) WriteSeq(SR01_CLOCKING, clocking);
+}
+
+static uint32_t WholeMegahertz(double hz) { return (uint32_t)trunc(hz / 1e6 + 0.5); }
 
 static uint32_t GetMemoryClock()
 {
     if (!OpenRegisterAccess()) return 0;
-    SynthSetting s = ReadMemoryClockFields();
+    UnlockExtendedSequencer();
+    SynthSetting s = ReadClock(&s3_mclk);
     CloseRegisterAccess();
     if (s.m == 0) return 0;
-    return (uint32_t)trunc(SynthFrequency(&s3_mclk_limits, s) + 0.5);
+    return WholeMegahertz(SynthFrequency(&s3_mclk_limits, s));
 }
 
 static uint32_t SetMemoryClock(uint32_t mhz)
 {
     if (!OpenRegisterAccess()) return 0;
-    SynthSetting s = ReadMemoryClockFields();
-    if (!SearchSynthesizer(&s3_mclk_limits, (double)mhz, &s)) {
-        CloseRegisterAccess();
-        return 0;
-    }
     UnlockExtendedSequencer();
-    WriteSeq(SR11_MCLK_M, (uint8_t)(s.m | (ReadSeq(SR11_MCLK_M) & 0x80)));
-    WriteSeq(SR10_MCLK_NR, (uint8_t)(s.n | s.r << 5 | (ReadSeq(SR10_MCLK_NR) & 0x80)));
+    SynthSetting s = ReadClock(&s3_mclk);
+    bool fits = SearchSynthesizer(&s3_mclk_limits, mhz * 1e6, &s);
+    if (fits) CommitClock(&s3_mclk, s);
     CloseRegisterAccess();
-    return GetMemoryClock();
+    return fits ? GetMemoryClock() : 0;
 }
 
 uint32_t S3Dispatch(uint32_t command, uintptr_t argument)
@@ -246,8 +306,7 @@ uint32_t S3Dispatch(uint32_t command, uintptr_t argument)
     case CMD_READ_PORT: return ChipInByte(&s3_ports, (uint16_t)argument);
     case CMD_GET_MEM_SIZE: return MemorySize();
     case CMD_PREPARE_MODE: return PrepareMode();
-    case CMD_MAP_REGISTERS:
-        return MapRegisterWindow(CurrentChip()->layout == CLOCK_SAVAGE3D ? &savage3d_window : &s3_window);
+    case CMD_MAP_REGISTERS: return MapRegisterWindow(CurrentChip()->window);
     case CMD_IS_INTERLACED: return IsInterlaced();
     case CMD_GET_MCLK: return GetMemoryClock();
     case CMD_SET_MCLK: return SetMemoryClock((uint32_t)argument);
@@ -257,35 +316,8 @@ uint32_t S3Dispatch(uint32_t command, uintptr_t argument)
     return 0;
 }
 
-static SynthSetting ReadPixelClockFields()
-{
-    UnlockExtendedSequencer();
-    uint8_t sr12 = ReadSeq(SR12_DCLK_NR);
-    uint8_t sr13 = ReadSeq(SR13_DCLK_M);
-    SynthSetting s;
-    switch (CurrentChip()->layout) {
-    case CLOCK_SAVAGE3D: {
-        uint8_t sr29 = ReadSeq(SR29_DCLK_HIGH);
-        s.m = (uint16_t)(sr13 + 256 * ((sr29 >> 3) & 1));
-        s.n = (uint16_t)((sr12 & 0x3F) + 64 * ((sr29 >> 4) & 1));
-        s.r = (uint16_t)(((sr12 >> 6) & 3) + 4 * ((sr29 >> 2) & 1));
-        break;
-    }
-    case CLOCK_R_2BITS:
-        s.m = sr13 & 0x7F;
-        s.n = sr12 & 0x1F;
-        s.r = (sr12 >> 5) & 3;
-        break;
-    default:
-        s.m = sr13 & 0x7F;
-        s.n = sr12 & 0x1F;
-        s.r = (sr12 >> 5) & 7;
-        break;
-    }
-    return s;
-}
-
 // SR18 bit 7: above 8 bits per pixel the DCLK runs at twice the CRT rate.
+// SR18 answers only while the extended sequencer is unlocked.
 static bool ClockDoubled()
 {
     return CurrentAdapter()->bits_per_pixel != 8 && (ReadSeq(SR18_RAMDAC) & sr18_clock_doubled);
@@ -293,37 +325,18 @@ static bool ClockDoubled()
 
 double S3GetPixelClock()
 {
-    SynthSetting s = ReadPixelClockFields();
-    double hz = SynthFrequency(&s3_dclk_limits, s);
+    UnlockExtendedSequencer();
+    double hz = SynthFrequency(s3_dclk_limits, ReadClock(CurrentChip()->dclk));
     return ClockDoubled() ? hz / 2 : hz;
-}
-
-static void WriteSavage3DClock(SynthSetting s)
-{
-    uint8_t clocking = ReadSeq(SR01_CLOCKING);
-    // Blank the screen while the synthesizer fields are inconsistent.
-    WriteSeq(SR01_CLOCKING, (uint8_t)(clocking | sr01_screen_off));
-    uint8_t high = ReadSeq(SR29_DCLK_HIGH) & sr29_kept;
-    if (s.m >= 256) { s.m -= 256; high |= 0x08; }
-    if (s.n >= 64) { s.n -= 64; high |= 0x10; }
-    if (s.r >= 4) { s.r -= 4; high |= 0x04; }
-    WriteSeq(SR29_DCLK_HIGH, high);
-    WriteSeq(SR13_DCLK_M, (uint8_t)s.m);
-    WriteSeq(SR12_DCLK_NR, (uint8_t)(s.n | s.r << 6));
-    WriteSeq(SR01_CLOCKING, clocking);
 }
 
 uint32_t S3SetPixelClock(double hz)
 {
-    if (ClockDoubled()) hz *= 2;
-    SynthSetting s = ReadPixelClockFields();
-    if (!SearchSynthesizer(&s3_dclk_limits, hz, &s)) return 0;
+    const S3ClockFields* fields = CurrentChip()->dclk;
     UnlockExtendedSequencer();
-    if (CurrentChip()->layout == CLOCK_SAVAGE3D) {
-        WriteSavage3DClock(s);
-    } else {
-        WriteSeq(SR13_DCLK_M, (uint8_t)(s.m | (ReadSeq(SR13_DCLK_M) & 0x80)));
-        WriteSeq(SR12_DCLK_NR, (uint8_t)(s.n | s.r << 5));
-    }
+    if (ClockDoubled()) hz *= 2;
+    SynthSetting s = ReadClock(fields);
+    if (!SearchSynthesizer(s3_dclk_limits, hz, &s)) return 0;
+    CommitClock(fields, s);
     return 1;
 }

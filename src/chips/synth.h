@@ -6,12 +6,12 @@
 #include <stdint.h>
 
 struct SynthLimits {
-    double fref;  // reference crystal, in the unit of the frequencies
-    int a, b;     // offsets of the M and N fields
+    double fref_hz;  // reference crystal
+    int a, b;        // offsets of the M and N fields
     uint16_t m_min, m_max;
     uint16_t n_min, n_max;
     uint16_t r_min, r_max;
-    double vco_min, vco_max;
+    double vco_min_hz, vco_max_hz;
 };
 
 struct SynthSetting {
@@ -20,7 +20,7 @@ struct SynthSetting {
 
 enum { SYNTH_SEARCH_STEPS = 20 };
 
-extern const double reference_crystal_hz;
+inline constexpr double reference_crystal_hz = 14318180.0;
 
 double SynthFrequency(const SynthLimits* limits, SynthSetting s);
 
@@ -28,6 +28,6 @@ double SynthFrequency(const SynthLimits* limits, SynthSetting s);
 // the current N and R in *setting: M follows from N and R, and N (then R)
 // moves by one until M fits, for at most 20 steps. Returns 1 with the fit in
 // *setting, 0 with *setting unchanged.
-int SearchSynthesizer(const SynthLimits* limits, double target, SynthSetting* setting);
+int SearchSynthesizer(const SynthLimits* limits, double target_hz, SynthSetting* setting);
 
 #endif

@@ -8,9 +8,9 @@
 #include "base/settings.h"
 #include "chips/chip_io.h"
 #include "chips/chips.h"
+#include "chips/reg_field.h"
 
 int adjust_offset_h, adjust_offset_v;
-
 
 enum : uint8_t {
     CR02_HBLANK_START = 0x02,
@@ -22,21 +22,16 @@ enum : uint8_t {
     CR15_VBLANK_START = 0x15,
 };
 
-static const uint8_t cr07_vretrace_bit8 = 0x04;
-static const uint8_t cr07_vblank_bit8 = 0x08;
-static const uint8_t cr07_vretrace_bit9 = 0x80;
-static const uint8_t cr09_vblank_bit9 = 0x20;
+static constexpr RegField horizontal_blank_start = {{CR02_HBLANK_START, 0, 7}};
+static constexpr RegField horizontal_retrace_start = {{CR04_HRETRACE_START, 0, 7}};
+static constexpr RegField vertical_blank_start = {
+    {CR15_VBLANK_START, 0, 7}, {CR07_OVERFLOW, 3, 3}, {CR09_MAX_SCAN_LINE, 5, 5}};
+static constexpr RegField vertical_retrace_start = {
+    {CR10_VRETRACE_START, 0, 7}, {CR07_OVERFLOW, 2, 2}, {CR07_OVERFLOW, 7, 7}};
+// The stored V value: CR10 and the whole overflow register CR07.
+static constexpr RegField stored_v_registers = {{CR10_VRETRACE_START, 0, 7}, {CR07_OVERFLOW, 0, 7}};
+
 static const uint8_t cr11_write_protect = 0x80;
-
-static const unsigned hretrace_highest = 0xFF;    // CR04 alone
-static const unsigned vretrace_highest = 0x3FF;   // CR10 + two overflow bits
-
-// The stored V value is CR10 + 256 * CR07, so CR07's retrace bits 2 and 7
-// sit at bits 10 and 15 of it.
-static const uint32_t stored_v_retrace_bits = 0x8400;
-static const uint8_t cr07_kept_on_restore = 0x7B;
-static const int32_t stored_h_highest = 255;
-static const int32_t stored_v_highest = 65535;
 
 static uint8_t ReadCrtc(uint8_t index)
 {
@@ -49,6 +44,29 @@ static void WriteCrtc(uint8_t index, uint8_t value)
     chip_write_port(VGA_CRTC_INDEX, index);
     chip_write_port(VGA_CRTC_DATA, value);
 }
+
+static const RegAccess crtc = {.read = ReadCrtc, .write = WriteCrtc};
+
+// A run of vertical steps keeps CR07 in a copy read once; each step writes
+// the copy after CR10.
+static uint8_t working_overflow;
+
+static uint8_t ReadStepping(uint8_t index) { return index == CR07_OVERFLOW ? working_overflow : ReadCrtc(index); }
+
+static void WriteStepping(uint8_t index, uint8_t value)
+{
+    if (index == CR07_OVERFLOW) working_overflow = value;
+    else WriteCrtc(index, value);
+}
+
+static const RegAccess stepping_crtc = {.read = ReadStepping, .write = WriteStepping};
+
+// The stored V value being restored, read as the registers it was taken from.
+static uint32_t restored_v;
+
+static uint8_t ReadRestored(uint8_t index) { return (uint8_t)(index == CR07_OVERFLOW ? restored_v >> 8 : restored_v); }
+
+static const RegAccess restored_registers = {.read = ReadRestored, .write = nullptr};
 
 // CR11 bit 7 write-protects CR00-CR07; clear it before moving the retrace.
 // Returns CR11 as it was, for RelockCrtc.
@@ -88,33 +106,24 @@ bool DirectionOfKey(unsigned virtual_key, StepDirection* direction)
     return false;
 }
 
-// One vertical step on the working copy of CR07; false when refused.
-static bool StepVertical(int delta, uint8_t* overflow)
+static bool StepVertical(int delta)
 {
-    unsigned blank = ReadCrtc(CR15_VBLANK_START);
-    if (*overflow & cr07_vblank_bit8) blank |= 0x100;
-    if (ReadCrtc(CR09_MAX_SCAN_LINE) & cr09_vblank_bit9) blank |= 0x200;
-    unsigned retrace = ReadCrtc(CR10_VRETRACE_START);
-    if (*overflow & cr07_vretrace_bit8) retrace |= 0x100;
-    if (*overflow & cr07_vretrace_bit9) retrace |= 0x200;
-
-    int next = SteppedRetraceStart(retrace, blank, delta, vretrace_highest);
+    unsigned blank = ReadField(&stepping_crtc, &vertical_blank_start);
+    unsigned retrace = ReadField(&stepping_crtc, &vertical_retrace_start);
+    int next = SteppedRetraceStart(retrace, blank, delta, vertical_retrace_start.Highest());
     if (next < 0) return false;
-    *overflow &= (uint8_t)~(cr07_vretrace_bit8 | cr07_vretrace_bit9);
-    if (next & 0x200) *overflow |= cr07_vretrace_bit9;
-    if (next & 0x100) *overflow |= cr07_vretrace_bit8;
-    WriteCrtc(CR10_VRETRACE_START, (uint8_t)next);
-    WriteCrtc(CR07_OVERFLOW, *overflow);
+    WriteField(&stepping_crtc, &vertical_retrace_start, (uint32_t)next);
+    WriteCrtc(CR07_OVERFLOW, working_overflow);
     return true;
 }
 
 static bool StepHorizontal(int delta)
 {
-    unsigned blank = ReadCrtc(CR02_HBLANK_START);
-    unsigned retrace = ReadCrtc(CR04_HRETRACE_START);
-    int next = SteppedRetraceStart(retrace, blank, delta, hretrace_highest);
+    unsigned blank = ReadField(&crtc, &horizontal_blank_start);
+    unsigned retrace = ReadField(&crtc, &horizontal_retrace_start);
+    int next = SteppedRetraceStart(retrace, blank, delta, horizontal_retrace_start.Highest());
     if (next < 0) return false;
-    WriteCrtc(CR04_HRETRACE_START, (uint8_t)next);
+    WriteField(&crtc, &horizontal_retrace_start, (uint32_t)next);
     return true;
 }
 
@@ -127,11 +136,11 @@ int StepPicture(StepDirection direction, int count)
     // lost: report no step rather than steps that never happened.
     if (!chip_open_io()) return 0;
     uint8_t cr11 = UnlockCrtc();
-    uint8_t overflow = ReadCrtc(CR07_OVERFLOW);
+    working_overflow = ReadCrtc(CR07_OVERFLOW);
     int delta = StepDelta(direction);
     int done = 0;
     while (done < count) {
-        bool taken = StepIsVertical(direction) ? StepVertical(delta, &overflow) : StepHorizontal(delta);
+        bool taken = StepIsVertical(direction) ? StepVertical(delta) : StepHorizontal(delta);
         if (!taken) break;
         ++done;
     }
@@ -163,12 +172,8 @@ void SavePosition(int horizontal, int vertical)
     if (horizontal == 0 && vertical == 0) return;
     // Registers that cannot be read would store 0, which deletes the value.
     if (!chip_open_io()) return;
-    int32_t h = horizontal != 0 ? ReadCrtc(CR04_HRETRACE_START) : 0;
-    int32_t v = 0;
-    if (vertical != 0) {
-        v = ReadCrtc(CR10_VRETRACE_START);
-        v += 256 * ReadCrtc(CR07_OVERFLOW);
-    }
+    int32_t h = horizontal != 0 ? ReadField(&crtc, &horizontal_retrace_start) : 0;
+    int32_t v = vertical != 0 ? ReadField(&crtc, &stored_v_registers) : 0;
     chip_close_io();
     if (horizontal != 0) SaveSetting(SETTING_POSITION_H, h);
     if (vertical != 0) SaveSetting(SETTING_POSITION_V, v);
@@ -192,11 +197,12 @@ int RestorePosition()
     if (h < 1 && v < 1) return 1;
     if (!chip_open_io()) return 1;
     uint8_t cr11 = UnlockCrtc();
-    if (h >= 1 && h <= stored_h_highest) WriteCrtc(CR04_HRETRACE_START, (uint8_t)h);
-    if (v >= 1 && v <= stored_v_highest) {
-        WriteCrtc(CR10_VRETRACE_START, (uint8_t)v);
-        uint8_t overflow = ReadCrtc(CR07_OVERFLOW);
-        WriteCrtc(CR07_OVERFLOW, (uint8_t)((overflow & cr07_kept_on_restore) | ((v & stored_v_retrace_bits) >> 8)));
+    if (h >= 1 && h <= (int32_t)horizontal_retrace_start.Highest())
+        WriteField(&crtc, &horizontal_retrace_start, (uint32_t)h);
+    if (v >= 1 && v <= (int32_t)stored_v_registers.Highest()) {
+        // Only the retrace start's bits of the stored CR07: the others stay as the mode set them.
+        restored_v = (uint32_t)v;
+        WriteField(&crtc, &vertical_retrace_start, ReadField(&restored_registers, &vertical_retrace_start));
     }
     RelockCrtc(cr11);
     chip_close_io();

@@ -38,6 +38,13 @@ TEST_F(StepPictureTest, VerticalCarriesOverflowBitsAndStopsAtTenBitBlank)
     EXPECT_EQ(3, StepPicture(STEP_DOWN, 21));
     EXPECT_EQ(768u, VerticalRetrace());
     EXPECT_EQ(0x85, Crtc(0x11));
+    // Blank start 0xFF under retrace 0x100: each takes bit 8 from its own CR07 bit.
+    SetCrtc(0x15, 0xFF);
+    SetCrtc(0x09, 0x40);
+    SetCrtc(0x07, 0x37);
+    SetCrtc(0x10, 0x00);
+    EXPECT_EQ(1, StepPicture(STEP_DOWN, 3));
+    EXPECT_EQ(0xFFu, VerticalRetrace());
 }
 
 TEST_F(StepPictureTest, UndoReturnsMixedOffsets)

@@ -15,8 +15,6 @@
 #include "support/machine.h"
 #include "support/support.h"
 
-static const uint16_t s3_ids[] = {0x8a13, 0x8a20, 0x8a21, 0x8904, 0x5631, 0x883d, 0x8a01, 0x8a10, 0x8811, 0x8901};
-
 static void BootS3(uint16_t device_id, int windows = SIM_WINDOWS_98, uint8_t bus = 0)
 {
     BootMachine(Machine(windows, {Card(0x5333, device_id, bus, bus ? 0 : 10)}));
@@ -84,6 +82,10 @@ TEST(S3PixelClock, EveryChipLandsJustBelowTheTargetInsideItsWindow)
     for (const VcoWindow& w : windows) {
         BootS3(w.id);
         bool doubled = CurrentAdapter()->bits_per_pixel != 8 && (SimReadRegister(0, SIM_REG_SEQUENCER, 0x18) & 0x80);
+        // Beside the fields SR13 bit 7 is kept, and SR12 bit 7 of the chips with a two-bit R cleared.
+        bool savage = w.id == 0x8a20 || w.id == 0x8a21, r2 = w.id == 0x5631 || w.id == 0x8811;
+        if (!savage) SimWriteRegister(0, SIM_REG_SEQUENCER, 0x13, SimReadRegister(0, SIM_REG_SEQUENCER, 0x13) | 0x80);
+        if (r2) SimWriteRegister(0, SIM_REG_SEQUENCER, 0x12, SimReadRegister(0, SIM_REG_SEQUENCER, 0x12) | 0x80);
         chip_open_io();
         double running = chip_get_pixel_clock();
         chip_close_io();
@@ -94,6 +96,8 @@ TEST(S3PixelClock, EveryChipLandsJustBelowTheTargetInsideItsWindow)
             double read = chip_get_pixel_clock();
             chip_close_io();
             ASSERT_EQ(1u, ok) << std::hex << w.id << std::dec << " " << target;
+            if (!savage) EXPECT_EQ(0x80, SimReadRegister(0, SIM_REG_SEQUENCER, 0x13) & 0x80);
+            if (r2) EXPECT_EQ(0, SimReadRegister(0, SIM_REG_SEQUENCER, 0x12) & 0x80);
             int n, r;
             DecodeDclk(w.id, &n, &r);
             double out = SimPixelClockHz(0);
@@ -135,6 +139,8 @@ TEST(S3PixelClock, DoubledAboveEightBits)
     CurrentAdapter()->bits_per_pixel = 16;
     chip_open_io();
     double running = chip_get_pixel_clock();
+    // SR18 reads 0 while the extended sequencer is locked.
+    SimWriteRegister(0, SIM_REG_SEQUENCER, 0x08, 0x00);
     ASSERT_EQ(1u, chip_set_pixel_clock(running * 1.1));
     double read16 = chip_get_pixel_clock();
     chip_close_io();
@@ -146,13 +152,38 @@ TEST(S3PixelClock, DoubledAboveEightBits)
     chip_close_io();
 }
 
+// Raw synthesizer fields with the bits each layout ignores or adds, read as
+// the model reads them.
+TEST(S3PixelClock, EachLayoutReadsAsTheModel)
+{
+    struct Case {
+        uint16_t id;
+        uint8_t sr12, sr13, sr29;
+    } cases[] = {
+        {0x8901, 0x85, 0xE4, 0x00},  // R = 4; SR13 bit 7 is not M
+        {0x5631, 0xA7, 0x64, 0x00},  // R has two bits: SR12 bit 7 is not R
+        {0x8a20, 0x4A, 0x2C, 0xF3},  // SR29 bit 4: N + 64
+        {0x8a20, 0x8A, 0x2C, 0xEC},  // SR29 bits 3 and 2: M + 256, R + 4
+    };
+    for (const Case& c : cases) {
+        BootS3(c.id);
+        CurrentAdapter()->bits_per_pixel = 8;
+        SimWriteRegister(0, SIM_REG_SEQUENCER, 0x12, c.sr12);
+        SimWriteRegister(0, SIM_REG_SEQUENCER, 0x13, c.sr13);
+        SimWriteRegister(0, SIM_REG_SEQUENCER, 0x29, c.sr29);
+        chip_open_io();
+        EXPECT_NEAR(SimPixelClockHz(0), chip_get_pixel_clock(), 1.0) << std::hex << c.id << " " << (int)c.sr12;
+        chip_close_io();
+    }
+}
+
 TEST(S3Registers, TimingTotalsAsTheModelCountsThem)
 {
-    for (uint16_t id : s3_ids) {
-        BootS3(id);
+    for (const VcoWindow& w : windows) {
+        BootS3(w.id);
         chip_open_io();
-        EXPECT_EQ((uint32_t)SimHTotal(0), chip_get_htotal()) << std::hex << id;
-        EXPECT_EQ((uint32_t)SimVTotal(0), chip_get_vtotal()) << std::hex << id;
+        EXPECT_EQ((uint32_t)SimHTotal(0), chip_get_htotal()) << std::hex << w.id;
+        EXPECT_EQ((uint32_t)SimVTotal(0), chip_get_vtotal()) << std::hex << w.id;
         chip_close_io();
     }
     BootS3(0x8a20);
@@ -183,9 +214,18 @@ TEST(S3Registers, MemorySizeFromTheStraps)
         ASSERT_EQ(1, DetectAdapters());
         EXPECT_EQ(c.mb << 16, chip_get_mem_size()) << std::hex << c.id << " " << std::dec << c.mb;
     }
+    BootS3(0x883d);
+    SimWriteRegister(0, SIM_REG_CRTC, 0x36, 0xC0);  // bit 7 is not the ViRGE/VX's
+    EXPECT_EQ(6u << 16, chip_get_mem_size());
     // Straps the older chips do not define show no size at all.
     BootS3(0x8901);
     SimWriteRegister(0, SIM_REG_CRTC, 0x36, 0x2E);
+    EXPECT_EQ(0u, chip_get_mem_size());
+    // Nor do registers that cannot be read (a 0 strap would say 4 MB).
+    BootS3(0x8901, SIM_WINDOWS_NT4);
+    SimMachineConfig config = Machine(SIM_WINDOWS_NT4, {Card(0x5333, 0x8901)});
+    config.nt_device = false;
+    SimBoot(&config);
     EXPECT_EQ(0u, chip_get_mem_size());
 }
 

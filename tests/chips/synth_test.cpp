@@ -2,52 +2,41 @@
 
 #include "chips/synth.h"
 
-// The S3 memory clock: MHz, M 1..127, N 1..31, R 0..3, VCO 135 to 270 MHz.
-static const SynthLimits mclk = {14.31818, 2, 2, 1, 127, 1, 31, 0, 3, 135.0, 270.0};
-// The Trio64V2 pixel clock: Hz, R up to 4, VCO 140 to 340 MHz.
-static const SynthLimits trio64v2_dclk = {14318180.0, 2, 2, 1, 127, 1, 31, 0, 4, 140e6, 340e6};
+// The S3 memory clock: M 1..127, N 1..31, R 0..3, VCO 135 to 270 MHz.
+static const SynthLimits mclk = {.fref_hz = 14318180.0, .a = 2, .b = 2, .m_min = 1, .m_max = 127,
+                                 .n_min = 1, .n_max = 31, .r_min = 0, .r_max = 3,
+                                 .vco_min_hz = 135e6, .vco_max_hz = 270e6};
+// The Trio64V2 pixel clock: R up to 4, VCO 140 to 340 MHz.
+static const SynthLimits trio64v2_dclk = {.fref_hz = 14318180.0, .a = 2, .b = 2, .m_min = 1, .m_max = 127,
+                                          .n_min = 1, .n_max = 31, .r_min = 0, .r_max = 4,
+                                          .vco_min_hz = 140e6, .vco_max_hz = 340e6};
 
-TEST(SynthesizerSearch, FitAfterStepsDownFromTheCurrentDivider)
+// Each search starts from the N and R of the setting; without a fit the
+// setting comes back unchanged.
+TEST(SynthesizerSearch, StepsFromTheCurrentDividerForTwentyTriesAtMost)
 {
-    // From N = 12, R = 1: M = 134 is too high, N = 11 gives M = 125 with the
-    // VCO at 127/13 x fref = 139.9 MHz, inside the window.
-    SynthSetting s = {115, 12, 1};
-    ASSERT_EQ(1, SearchSynthesizer(&mclk, 70.0, &s));
-    EXPECT_EQ(125, s.m);
-    EXPECT_EQ(11, s.n);
-    EXPECT_EQ(1, s.r);
-    EXPECT_NEAR(69.94, SynthFrequency(&mclk, s), 0.01);
-
-    // 78.75 MHz = 5.5 x fref: N walks down from 12 to 9 before M fits in
-    // seven bits, and lands on the frequency exactly.
-    s = {0, 12, 1};
-    ASSERT_EQ(1, SearchSynthesizer(&trio64v2_dclk, 78.75e6, &s));
-    EXPECT_EQ(119, s.m);
-    EXPECT_EQ(9, s.n);
-    EXPECT_EQ(1, s.r);
-    EXPECT_NEAR(78.75e6, SynthFrequency(&trio64v2_dclk, s), 10.0);
-}
-
-TEST(SynthesizerSearch, NoFitWithinTwentyStepsLeavesTheSettingAlone)
-{
-    // 60 MHz needs a VCO of 120 MHz at R = 1: too low at N = 12, too high at
-    // N = 13, and the search swings between them until it gives up.
-    SynthSetting s = {115, 12, 1};
-    EXPECT_EQ(0, SearchSynthesizer(&mclk, 60.0, &s));
-    EXPECT_EQ(115, s.m);
-    EXPECT_EQ(12, s.n);
-    EXPECT_EQ(1, s.r);
-}
-
-TEST(SynthesizerSearch, TooLowATargetWrapsToAHugeMultiplier)
-{
-    // trunc(...) = 0 and 0 - 2 wraps to 65534 in 16 bits: "too high" all the
-    // way down to N = 1 and R = 0, where the search ends.
-    SynthSetting s = {7, 12, 1};
-    EXPECT_EQ(0, SearchSynthesizer(&mclk, 0.001, &s));
-    EXPECT_EQ(7, s.m);
-    s = {7, 1, 0};
-    EXPECT_EQ(0, SearchSynthesizer(&mclk, 0.001, &s));
+    struct Case {
+        const char* what;
+        const SynthLimits* limits;
+        double target_hz;
+        SynthSetting start;
+        int fits;
+        SynthSetting end;
+    } cases[] = {
+        {"M = 134 too high at N = 12; N = 11 puts the VCO at 139.9 MHz", &mclk, 70e6, {115, 12, 1}, 1, {125, 11, 1}},
+        {"5.5 x fref: N walks down to 9 until M fits in 7 bits", &trio64v2_dclk, 78.75e6, {0, 12, 1}, 1, {119, 9, 1}},
+        {"the 20th try fits", &mclk, 20e6, {7, 28, 3}, 1, {120, 9, 3}},
+        {"the 21st try is not made", &mclk, 20e6, {7, 29, 3}, 0, {7, 29, 3}},
+        // trunc(...) - 2 wraps to 65534 in 16 bits: too high down to N = 1, R = 0.
+        {"too low a target", &mclk, 1000.0, {7, 12, 1}, 0, {7, 12, 1}},
+        {"too low a target at the lowest dividers", &mclk, 1000.0, {7, 1, 0}, 0, {7, 1, 0}},
+    };
+    for (const Case& c : cases) {
+        SynthSetting s = c.start;
+        EXPECT_EQ(c.fits, SearchSynthesizer(c.limits, c.target_hz, &s)) << c.what;
+        EXPECT_TRUE(s.m == c.end.m && s.n == c.end.n && s.r == c.end.r)
+            << c.what << ": " << s.m << " " << s.n << " " << s.r;
+    }
 }
 
 TEST(SynthesizerSearch, EveryFitLiesInTheWindowAndBelowTheTarget)
@@ -57,12 +46,12 @@ TEST(SynthesizerSearch, EveryFitLiesInTheWindowAndBelowTheTarget)
             for (uint16_t r = 0; r <= 4; ++r) {
                 SynthSetting s = {1, n, r};
                 if (!SearchSynthesizer(&trio64v2_dclk, target, &s)) continue;
-                double vco = trio64v2_dclk.fref * (s.m + 2) / (s.n + 2);
+                double vco = trio64v2_dclk.fref_hz * (s.m + 2) / (s.n + 2);
                 EXPECT_GE(vco, 140e6);
                 EXPECT_LE(vco, 340e6);
                 double f = SynthFrequency(&trio64v2_dclk, s);
                 EXPECT_LE(f, target);  // M is truncated
-                EXPECT_GT(f, target - trio64v2_dclk.fref / ((s.n + 2) << s.r) - 1);
+                EXPECT_GT(f, target - trio64v2_dclk.fref_hz / ((s.n + 2) << s.r) - 1);
             }
         }
     }
