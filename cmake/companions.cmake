@@ -3,9 +3,9 @@
 add_library(HookKeep SHARED ${VISTREL_ROOT}/companions/hookkeep.cpp ${VISTREL_ROOT}/companions/keep_call.cpp
             ${VISTREL_ROOT}/companions/hookkeep.def)
 set_target_properties(HookKeep PROPERTIES PREFIX "" OUTPUT_NAME HookKeep IMPORT_PREFIX "lib" IMPORT_SUFFIX ".dll.a")
-target_compile_options(HookKeep PRIVATE ${VISTREL_PROGRAM_FLAGS})
-target_link_options(HookKeep PRIVATE -Wl,--kill-at ${VISTREL_COMPANION_LINK_FLAGS})
-target_link_libraries(HookKeep PRIVATE user32)
+target_compile_options(HookKeep PRIVATE ${VISTREL_PROGRAM_FLAGS} ${VISTREL_CODE_FLAGS})
+target_link_options(HookKeep PRIVATE -Wl,--kill-at ${VISTREL_COMPANION_LINK_FLAGS} ${VISTREL_DLL_ENTRY})
+target_link_libraries(HookKeep PRIVATE vistrel_runtime user32 ${VISTREL_RUNTIME_LIBS})
 target_include_directories(HookKeep PRIVATE ${VISTREL_ROOT}/companions ${VISTREL_ROOT}/src)
 if(CMAKE_SIZEOF_VOID_P EQUAL 4)
   # ld's import library carries the killed name too, where a 32-bit caller
@@ -17,7 +17,7 @@ endif()
 
 add_executable(gatectl WIN32 ${VISTREL_ROOT}/companions/gatectl.cpp ${VISTREL_ROOT}/companions/gate.cpp
                ${VISTREL_ROOT}/src/hardware/shutdown.cpp)
-target_compile_options(gatectl PRIVATE ${VISTREL_PROGRAM_FLAGS})
-target_link_options(gatectl PRIVATE ${VISTREL_COMPANION_LINK_FLAGS})
-target_link_libraries(gatectl PRIVATE user32 advapi32)
+target_compile_options(gatectl PRIVATE ${VISTREL_PROGRAM_FLAGS} ${VISTREL_CODE_FLAGS})
+target_link_options(gatectl PRIVATE ${VISTREL_COMPANION_LINK_FLAGS} ${VISTREL_EXE_ENTRY})
+target_link_libraries(gatectl PRIVATE vistrel_runtime user32 advapi32 ${VISTREL_RUNTIME_LIBS})
 target_include_directories(gatectl PRIVATE ${VISTREL_ROOT}/companions ${VISTREL_ROOT}/src)

@@ -7,6 +7,9 @@ set(TEST_DIR ${CMAKE_BINARY_DIR}/tests)
 set(CMAKE_ARCHIVE_OUTPUT_DIRECTORY ${CMAKE_BINARY_DIR}/lib)
 set(VISTREL_STATIC_RUNTIME -static)
 set(VISTREL_COMPANION_LINK_FLAGS ${VISTREL_STATIC_RUNTIME})
+add_library(vistrel_runtime STATIC ${VISTREL_ROOT}/src/base/runtime_std.cpp)
+target_include_directories(vistrel_runtime PRIVATE ${VISTREL_ROOT}/src)
+target_compile_options(vistrel_runtime PRIVATE ${VISTREL_PROGRAM_FLAGS})
 
 include(${VISTREL_ROOT}/cmake/companions.cmake)
 set_target_properties(HookKeep gatectl PROPERTIES RUNTIME_OUTPUT_DIRECTORY ${SIM_DIR} LIBRARY_OUTPUT_DIRECTORY ${SIM_DIR})
@@ -15,7 +18,7 @@ set_target_properties(HookKeep gatectl PROPERTIES RUNTIME_OUTPUT_DIRECTORY ${SIM
 add_library(vistrel_core STATIC ${VISTREL_PROGRAM_SOURCES})
 target_include_directories(vistrel_core PUBLIC ${VISTREL_ROOT}/src ${VISTREL_ROOT}/resources ${VISTREL_ROOT}/companions)
 target_compile_options(vistrel_core PRIVATE ${VISTREL_PROGRAM_FLAGS})
-target_link_libraries(vistrel_core PUBLIC HookKeep ${VISTREL_SYSTEM_LIBS})
+target_link_libraries(vistrel_core PUBLIC HookKeep vistrel_runtime ${VISTREL_SYSTEM_LIBS})
 
 # The simulated machine beneath it.
 file(GLOB VISTREL_SIM_SOURCES CONFIGURE_DEPENDS ${VISTREL_ROOT}/sim/*.cpp)

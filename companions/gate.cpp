@@ -1,9 +1,9 @@
 #include "gate.h"
 
 #include <ddraw.h>
-#include <string.h>
 
 #include "base/protocol.h"
+#include "base/runtime.h"
 #include "hardware/shutdown.h"
 
 static const char* SkipBlanks(const char* s)
@@ -22,6 +22,14 @@ static size_t WordLength(const char* s)
 
 static bool RestIsBlank(const char* s) { return *SkipBlanks(s) == 0; }
 
+// The word at s is word (lower case) in any case of ASCII letters.
+static bool IsWord(const char* s, size_t n, const char* word)
+{
+    for (size_t i = 0; i < n; ++i)
+        if ((s[i] | 0x20) != word[i]) return false;
+    return word[n] == 0;
+}
+
 int ParseGateCommand(const char* arguments, GateRequest* request)
 {
     request->command = GATE_NONE;
@@ -36,13 +44,13 @@ int ParseGateCommand(const char* arguments, GateRequest* request)
         // the exact request does it.
         s = SkipBlanks(s + 1);
         n = WordLength(s);
-        if (n != 7 || _strnicmp(s, "restart", 7) != 0 || !RestIsBlank(s + n)) return GATE_NONE;
+        if (!IsWord(s, n, "restart") || !RestIsBlank(s + n)) return GATE_NONE;
         request->command = GATE_RESTART;
         return GATE_RESTART;
     }
     if (s[0] == '3') {
         s = SkipBlanks(s + 1);
-        size_t length = strlen(s);
+        size_t length = TextLength(s);
         while (length > 0 && (s[length - 1] == ' ' || s[length - 1] == '\t')) --length;
         if (length >= 2 && s[0] == '"' && s[length - 1] == '"') {
             ++s;

@@ -6,8 +6,20 @@ foreach(version 95 98 NT4 modern)
   set_property(TEST shell-detect-${version} APPEND PROPERTY ENVIRONMENT VISTREL_EXPECT_WINDOWS=${version})
 endforeach()
 
+# The product's runtime body, built for this machine without a C runtime,
+# held against the standard body.
+vistrel_test(base)
+add_library(runtime-win32 SHARED ${VISTREL_ROOT}/src/base/runtime_win32.cpp ${VISTREL_ROOT}/tests/base/body/runtime_body.cpp)
+target_include_directories(runtime-win32 PRIVATE ${VISTREL_ROOT}/src)
+target_compile_options(runtime-win32 PRIVATE ${VISTREL_PROGRAM_FLAGS} -fno-builtin)
+target_link_options(runtime-win32 PRIVATE -nostdlib -Wl,-e,BodyEntry)
+target_link_libraries(runtime-win32 PRIVATE kernel32 user32 gcc)
+set_target_properties(runtime-win32 PROPERTIES PREFIX "" RUNTIME_OUTPUT_DIRECTORY ${TEST_DIR})
+add_dependencies(test-base runtime-win32)
+vistrel_add_test(base base)
+
 # The product's files load on Windows 95, 98 and NT 4.0.
-add_test(NAME product-pe COMMAND ${VISTREL_ROOT}/tools/check-product-pe ${VISTREL_ROOT}/build/product)
+add_test(NAME product-pe COMMAND ${VISTREL_ROOT}/tools/check-product-pe ${VISTREL_ROOT}/build/product ${VISTREL_ROOT}/build/cmake-product)
 
 vistrel_test(chips)
 vistrel_add_test(chips chips)

@@ -1,7 +1,6 @@
 #include "adjust/adjust_pattern.h"
 
-#include <string.h>
-
+#include "base/runtime.h"
 #include "base/texts.h"
 
 static const COLORREF pattern_white = RGB(255, 255, 255);
@@ -134,20 +133,20 @@ static void DrawGlyph(HDC dc, Glyph glyph, int x, int y, int s)
 static void DrawLabelled(HDC dc, Glyph glyph, int x, int y, int s, const char* text)
 {
     DrawGlyph(dc, glyph, x, y, s);
-    TextOutA(dc, x + s + text_gap, y, text, (int)strlen(text));
+    TextOutA(dc, x + s + text_gap, y, text, (int)TextLength(text));
 }
 
 static int TextWidth(HDC dc, const char* text)
 {
     SIZE size = {0, 0};
-    GetTextExtentPoint32A(dc, text, (int)strlen(text), &size);
+    GetTextExtentPoint32A(dc, text, (int)TextLength(text), &size);
     return size.cx;
 }
 
 void DrawKeyLegend(HDC dc, const RECT* client, const LegendTexts* texts)
 {
     SIZE sample = {0, 0};
-    GetTextExtentPoint32A(dc, legend_sample, (int)strlen(legend_sample), &sample);
+    GetTextExtentPoint32A(dc, legend_sample, (int)TextLength(legend_sample), &sample);
     LegendLayout at = ComputeLegendLayout(client->right - client->left, client->bottom - client->top,
                                           TextWidth(dc, texts->right), sample.cx, sample.cy);
 
@@ -165,9 +164,9 @@ void DrawKeyLegend(HDC dc, const RECT* client, const LegendTexts* texts)
 
     int escape_x = at.x0 + at.column;
     SetTextColor(dc, legend_glyph_colour);
-    TextOutA(dc, escape_x, at.row2_y, escape_label, (int)strlen(escape_label));
+    TextOutA(dc, escape_x, at.row2_y, escape_label, (int)TextLength(escape_label));
     SetTextColor(dc, legend_text_colour);
-    TextOutA(dc, escape_x + TextWidth(dc, escape_label), at.row2_y, texts->cancel, (int)strlen(texts->cancel));
+    TextOutA(dc, escape_x + TextWidth(dc, escape_label), at.row2_y, texts->cancel, (int)TextLength(texts->cancel));
     DrawLabelled(dc, GLYPH_ENTER, at.x0 + 2 * at.column, at.row2_y, s, texts->save);
 
     SetTextColor(dc, old_colour);

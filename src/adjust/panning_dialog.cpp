@@ -1,9 +1,8 @@
 #include "adjust/panning_dialog.h"
 
-#include <stdio.h>
-
 #include "adjust/adjust_resources.h"
 #include "base/adapters.h"
+#include "base/runtime.h"
 #include "base/state.h"
 #include "base/texts.h"
 #include "hardware/driver_key.h"
@@ -99,7 +98,7 @@ static void ShowModeText(HWND dialog)
     int bits = TrueBitsPerPixel(GetDeviceCaps(screen, BITSPIXEL));
     ReleaseDC(NULL, screen);
     char text[MODE_TEXT_SIZE];
-    snprintf(text, sizeof text, "%dx%d--%d bits, %d Hz", width, height, bits, CurrentAdapter()->refresh_hz);
+    FormatText(text, sizeof text, "%dx%d--%d bits, %d Hz", width, height, bits, CurrentAdapter()->refresh_hz);
     SetDlgItemTextA(dialog, IDC_PANNING_MODE, text);
 }
 

@@ -1,8 +1,7 @@
 #include "base/adapters.h"
 
-#include <string.h>
-
 #include "base/module_reset.h"
+#include "base/runtime.h"
 
 AdapterRecord adapter_table[MAX_ADAPTERS];
 int16_t adapter_count;

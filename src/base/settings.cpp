@@ -1,11 +1,10 @@
 #include "base/settings.h"
 
-#include <stdio.h>
-#include <string.h>
 #include <windows.h>
 
 #include "base/adapters.h"
 #include "base/number.h"
+#include "base/runtime.h"
 
 const char settings_program_key[] = "SOFTWARE\\QUORVEL\\PANEL";
 
@@ -21,11 +20,11 @@ static bool IsProgramKeySetting(int id)
 static void BuildKeyPath(int id, char* path)
 {
     if (IsProgramKeySetting(id)) {
-        snprintf(path, KEY_PATH_SIZE, "%s", settings_program_key);
+        FormatText(path, KEY_PATH_SIZE, "%s", settings_program_key);
         return;
     }
     const AdapterRecord* a = CurrentAdapter();
-    snprintf(path, KEY_PATH_SIZE, "%s\\%04x%04x", settings_program_key, a->vendor_id, a->device_id);
+    FormatText(path, KEY_PATH_SIZE, "%s\\%04x%04x", settings_program_key, a->vendor_id, a->device_id);
 }
 
 // The value name of an id, empty for an id that names no value.
@@ -34,20 +33,20 @@ static void BuildValueName(int id, char* name)
     const AdapterRecord* a = CurrentAdapter();
     name[0] = 0;
     switch (id) {
-    case SETTING_REFRESH: strcpy(name, "refresh"); break;
-    case SETTING_WIDTH: strcpy(name, "width"); break;
-    case SETTING_HEIGHT: strcpy(name, "height"); break;
-    case SETTING_BITS: strcpy(name, "bits"); break;
+    case SETTING_REFRESH: CopyText(name, VALUE_NAME_SIZE, "refresh"); break;
+    case SETTING_WIDTH: CopyText(name, VALUE_NAME_SIZE, "width"); break;
+    case SETTING_HEIGHT: CopyText(name, VALUE_NAME_SIZE, "height"); break;
+    case SETTING_BITS: CopyText(name, VALUE_NAME_SIZE, "bits"); break;
     case SETTING_POSITION_H:
     case SETTING_POSITION_V:
-        snprintf(name, VALUE_NAME_SIZE, "%dx%dx%dx%d%c", a->width, a->height, a->bits_per_pixel, a->refresh_hz,
-                 id == SETTING_POSITION_H ? 'H' : 'V');
+        FormatText(name, VALUE_NAME_SIZE, "%dx%dx%dx%d%c", a->width, a->height, a->bits_per_pixel, a->refresh_hz,
+                   id == SETTING_POSITION_H ? 'H' : 'V');
         break;
-    case SETTING_STANDBY: strcpy(name, timer_value_names[0]); break;
-    case SETTING_SUSPEND: strcpy(name, timer_value_names[1]); break;
-    case SETTING_SHUTOFF: strcpy(name, timer_value_names[2]); break;
-    case SETTING_MCLK: strcpy(name, "mclk"); break;
-    case SETTING_MCLK_DEFAULT: strcpy(name, "mclkdef"); break;
+    case SETTING_STANDBY: CopyText(name, VALUE_NAME_SIZE, timer_value_names[0]); break;
+    case SETTING_SUSPEND: CopyText(name, VALUE_NAME_SIZE, timer_value_names[1]); break;
+    case SETTING_SHUTOFF: CopyText(name, VALUE_NAME_SIZE, timer_value_names[2]); break;
+    case SETTING_MCLK: CopyText(name, VALUE_NAME_SIZE, "mclk"); break;
+    case SETTING_MCLK_DEFAULT: CopyText(name, VALUE_NAME_SIZE, "mclkdef"); break;
     }
 }
 
@@ -79,7 +78,7 @@ static int32_t SaveToKey(HKEY key, int id, const char* name, int32_t value)
         return value;
     }
     char text[16];
-    int length = snprintf(text, sizeof text, "%d", (int)value);
+    int length = FormatText(text, sizeof text, "%d", (int)value);
     // Stored without a terminating zero; readers go by the data length.
     if (RegSetValueExA(key, name, 0, REG_SZ, (const BYTE*)text, (DWORD)length) != ERROR_SUCCESS) return -1;
     return value;

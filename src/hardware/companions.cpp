@@ -1,9 +1,8 @@
 #include "hardware/companions.h"
 
-#include <stdio.h>
-
 #include "base/module_reset.h"
 #include "base/protocol.h"
+#include "base/runtime.h"
 #include "base/settings.h"
 #include "hookkeep.h"
 
@@ -19,7 +18,7 @@ static uint32_t gate_memory_size;
 int GateRestart()
 {
     char command[GATE_COMMAND_SIZE];
-    snprintf(command, sizeof command, "%s 2 restart", gate_program);
+    FormatText(command, sizeof command, "%s 2 restart", gate_program);
     if (WinExec(command, SW_SHOW) >= 32) return 1;
     return restart_windows(EWX_REBOOT, 0) ? 1 : 0;
 }
@@ -41,7 +40,7 @@ uint32_t GateMemorySize()
 {
     if (gate_memory_size) return gate_memory_size;
     char command[GATE_COMMAND_SIZE];
-    snprintf(command, sizeof command, "%s 3 %s", gate_program, main_window_class);
+    FormatText(command, sizeof command, "%s 3 %s", gate_program, main_window_class);
     if (WinExec(command, SW_SHOW) < 32) return 0;
     gate_memory_size = WaitForGateReply();
     return gate_memory_size;

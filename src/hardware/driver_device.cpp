@@ -1,7 +1,6 @@
 #include "hardware/driver_device.h"
 
-#include <string.h>
-
+#include "base/runtime.h"
 #include "hardware/machine.h"
 
 const char zentra_device_name[] = "\\\\.\\Zentra";

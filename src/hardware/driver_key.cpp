@@ -2,12 +2,10 @@
 // where Windows keeps what it knows about the current adapter.
 #include "hardware/driver_key.h"
 
-#include <ctype.h>
-#include <stdio.h>
-#include <string.h>
 #include <windows.h>
 
 #include "base/adapters.h"
+#include "base/runtime.h"
 #include "base/state.h"
 #include "hardware/registry_text.h"
 
@@ -27,21 +25,16 @@ enum {
     NODE_KEY_SIZE = 80,
 };
 
-static void UpperCase(char* s)
-{
-    for (; *s; ++s) *s = (char)toupper((unsigned char)*s);
-}
-
 // The Config Manager node of the current adapter: its key name below
 // "Config Manager\Enum" and its hardware key.
 static int FindDeviceNode(char* node, DWORD node_size, char* hardware_key, DWORD key_size)
 {
     const AdapterRecord* a = CurrentAdapter();
     char pci[40], location[40];
-    snprintf(pci, sizeof pci, "PCI\\VEN_%04x&DEV_%04x", a->vendor_id, a->device_id);
-    snprintf(location, sizeof location, "BUS_%02x&DEV_%02x", a->bus, a->devfn >> 3);
-    UpperCase(pci);
-    UpperCase(location);
+    FormatText(pci, sizeof pci, "PCI\\VEN_%04x&DEV_%04x", a->vendor_id, a->device_id);
+    FormatText(location, sizeof location, "BUS_%02x&DEV_%02x", a->bus, a->devfn >> 3);
+    UpperText(pci);
+    UpperText(location);
     HKEY nodes;
     if (RegOpenKeyExA(HKEY_DYN_DATA, config_manager_enum, 0, KEY_READ, &nodes) != ERROR_SUCCESS) return 0;
     int found = 0;
@@ -51,9 +44,9 @@ static int FindDeviceNode(char* node, DWORD node_size, char* hardware_key, DWORD
         if (r == ERROR_MORE_DATA) continue;  // a name too long to be ours
         if (r != ERROR_SUCCESS) break;
         if (!ReadRegistryText(nodes, node, "HardWareKey", hardware_key, key_size)) continue;
-        UpperCase(hardware_key);
-        if (!strstr(hardware_key, pci)) continue;
-        if ((a->flags & ADAPTER_TWIN) && !strstr(hardware_key, location)) continue;
+        UpperText(hardware_key);
+        if (!FindInText(hardware_key, pci)) continue;
+        if ((a->flags & ADAPTER_TWIN) && !FindInText(hardware_key, location)) continue;
         found = 1;
     }
     RegCloseKey(nodes);
@@ -69,7 +62,7 @@ int FindDriverKey(char* out)
         // "\Registry\Machine\System\..." -> "System\..."
         const char* rest = path + 1;
         for (int i = 0; i < 2 && rest; ++i) {
-            rest = strchr(rest, '\\');
+            rest = FindChar(rest, '\\');
             if (rest) ++rest;
         }
         if (!rest) return -1;
@@ -79,9 +72,9 @@ int FindDriverKey(char* out)
     char node[HARDWARE_KEY_SIZE], hardware_key[HARDWARE_KEY_SIZE];
     if (!FindDeviceNode(node, sizeof node, hardware_key, sizeof hardware_key)) return -1;
     char enum_path[HARDWARE_KEY_SIZE + 8], driver[HARDWARE_KEY_SIZE];
-    snprintf(enum_path, sizeof enum_path, "Enum\\%s", hardware_key);
+    FormatText(enum_path, sizeof enum_path, "Enum\\%s", hardware_key);
     if (!ReadRegistryText(HKEY_LOCAL_MACHINE, enum_path, "Driver", driver, sizeof driver) || !driver[0]) return -1;
-    snprintf(out, DRIVER_KEY_SIZE, "%s%s", class_key_prefix, driver);
+    FormatText(out, DRIVER_KEY_SIZE, "%s%s", class_key_prefix, driver);
     return 1;
 }
 
@@ -90,7 +83,7 @@ int ReadDeviceNodeValue(const char* name, uint32_t* out)
     char node[NODE_KEY_SIZE], hardware_key[NODE_KEY_SIZE];
     if (!FindDeviceNode(node, sizeof node, hardware_key, sizeof hardware_key)) return -1;
     char path[sizeof config_manager_enum + NODE_KEY_SIZE + 1];
-    snprintf(path, sizeof path, "%s\\%s", config_manager_enum, node);
+    FormatText(path, sizeof path, "%s\\%s", config_manager_enum, node);
     HKEY key;
     if (RegOpenKeyExA(HKEY_DYN_DATA, path, 0, KEY_READ, &key) != ERROR_SUCCESS) return 0;
     DWORD size = sizeof *out;
@@ -103,8 +96,7 @@ int DriverKeyValue(const char* subkey, const char* name, void* buffer, uint32_t 
 {
     char path[KEY_PATH_SIZE];
     if (FindDriverKey(path) != 1) return -1;
-    if (strlen(path) + strlen(subkey) >= sizeof path) return -1;
-    strcat(path, subkey);
+    if (!AppendText(path, sizeof path, subkey)) return -1;
     HKEY key;
     if (RegOpenKeyExA(HKEY_LOCAL_MACHINE, path, 0, read ? KEY_READ : KEY_WRITE, &key) != ERROR_SUCCESS) return -1;
     LONG r;
@@ -125,12 +117,12 @@ int DriverImageName(char* out)
     if (FindDriverKey(path) != 1) return -1;
     int ok;
     if (platform == PLATFORM_NT) {
-        char* last = strrchr(path, '\\');
-        if (last) *last = 0;
+        const char* last = FindLastChar(path, '\\');
+        if (last) path[last - path] = 0;
         ok = ReadRegistryText(HKEY_LOCAL_MACHINE, path, "imagepath", out, VALUE_TEXT_SIZE);
     } else {
-        strcat(path, "\\DEFAULT");
-        ok = ReadRegistryText(HKEY_LOCAL_MACHINE, path, "drv", out, VALUE_TEXT_SIZE);
+        ok = AppendText(path, sizeof path, "\\DEFAULT") &&
+             ReadRegistryText(HKEY_LOCAL_MACHINE, path, "drv", out, VALUE_TEXT_SIZE);
     }
     if (!ok) out[0] = 0;
     return ok ? 1 : -1;
@@ -161,7 +153,7 @@ int NtDefaultBits()
     char service[SERVICE_NAME_SIZE];
     if (!FindPrimaryVideoService(service, sizeof service)) return 0;
     char path[sizeof nt_services + SERVICE_NAME_SIZE + 16];
-    snprintf(path, sizeof path, "%s%s\\device0", nt_services, service);
+    FormatText(path, sizeof path, "%s%s\\device0", nt_services, service);
     HKEY key;
     if (RegOpenKeyExA(HKEY_CURRENT_CONFIG, path, 0, KEY_READ, &key) != ERROR_SUCCESS) return 0;
     DWORD bits = 0, size = sizeof bits, type = 0;

@@ -1,12 +1,10 @@
 #include "modes/detect.h"
 
-#include <ctype.h>
 #include <stddef.h>
-#include <stdio.h>
-#include <string.h>
 #include <windows.h>
 
 #include "base/adapters.h"
+#include "base/runtime.h"
 #include "base/settings.h"
 #include "base/state.h"
 #include "chips/chips.h"
@@ -76,7 +74,7 @@ static void CompleteRecord(const char* section_format)
 {
     AdapterRecord* a = CurrentAdapter();
     char section[32];
-    snprintf(section, sizeof section, section_format, a->device_id);
+    FormatText(section, sizeof section, section_format, a->device_id);
     if (GetPrivateProfileIntA(section, "DefRef", 0, chip_ini_path) == defref_no_clock_refresh)
         a->flags |= ADAPTER_NO_CLOCK_REFRESH;
     a->mapped_registers = chip_map_registers();
@@ -168,9 +166,7 @@ static void TieToDisplayDevices(EnumDisplayDevicesA_fn enum_devices)
             if (DriverKeyValue("", "DriverDesc", description, DESCRIPTION_SIZE, REG_SZ, 1) != 1) description[0] = 0;
             // Windows 98 names the device with the whole description: compare
             // as much of both as a record keeps.
-            description[DEVICE_NAME_SIZE - 1] = 0;
-            if (strncmp(description, device.DeviceString, DEVICE_NAME_SIZE - 1) == 0 &&
-                (strlen(description) < DEVICE_NAME_SIZE - 1 || strlen(device.DeviceString) >= DEVICE_NAME_SIZE - 1)) {
+            if (SameText(description, device.DeviceString, DEVICE_NAME_SIZE - 1)) {
                 AdapterRecord* a = CurrentAdapter();
                 lstrcpynA(a->device_name, device.DeviceName, DEVICE_NAME_SIZE);
                 a->display_index = (uint16_t)n;

@@ -1,10 +1,10 @@
 #include "modes/display_settings.h"
 
-#include <string.h>
 #include <windows.h>
 
 #include "base/module_reset.h"
 #include "base/number.h"
+#include "base/runtime.h"
 #include "hardware/machine.h"
 
 enum { LISTED_MODES_KEPT = 2048 };

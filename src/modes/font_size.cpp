@@ -3,10 +3,9 @@
 // change; no font file is copied.
 #include "modes/font_size.h"
 
-#include <stdio.h>
-#include <string.h>
 #include <windows.h>
 
+#include "base/runtime.h"
 #include "base/state.h"
 
 static const int large_font_threshold = 108;  // dots per inch above this: large fonts
@@ -54,13 +53,13 @@ static const char nt_font_registry_key[] = "SOFTWARE\\Microsoft\\Windows NT\\Cur
 // with the terminating zero its readers expect.
 static void WriteText(HKEY key, const char* name, const char* text)
 {
-    RegSetValueExA(key, name, 0, REG_SZ, (const BYTE*)text, (DWORD)strlen(text) + 1);
+    RegSetValueExA(key, name, 0, REG_SZ, (const BYTE*)text, (DWORD)TextLength(text) + 1);
 }
 
 static void WriteNumberText(HKEY key, const char* name, int value)
 {
     char text[16];
-    snprintf(text, sizeof text, "%d", value);
+    FormatText(text, sizeof text, "%d", value);
     WriteText(key, name, text);
 }
 

@@ -1,11 +1,9 @@
 // Changing the refresh rate of the current mode, and whole display modes.
 #include "modes/mode_change.h"
 
-#include <stdlib.h>
-#include <string.h>
-
 #include "base/adapters.h"
 #include "base/number.h"
+#include "base/runtime.h"
 #include "base/settings.h"
 #include "base/state.h"
 #include "chips/chips.h"
@@ -20,9 +18,11 @@ static_assert(sizeof(DEVMODEA) == 156, "the mode request of the standard size, n
 static const DWORD interlaced_display_flag = 2;
 static const int nt_safe_rate = 60;
 
+static int Distance(int a, int b) { return a > b ? a - b : b - a; }
+
 bool RefreshCloseEnough(int target, int current)
 {
-    int distance = abs(current - target);
+    int distance = Distance(current, target);
     if (target > 90) return distance <= 5;
     return distance <= 3 || (target < 50 && current < 50);
 }
@@ -97,7 +97,7 @@ int SetRefreshRate(int target)
     }
     current = MeasuredRefreshRate();
     // A rate the clock could not reach is not running: nothing to keep.
-    if ((max < target || abs(current - target) > 5) && !ProgramRefreshClock(target)) return 0;
+    if ((max < target || Distance(current, target) > 5) && !ProgramRefreshClock(target)) return 0;
     SaveMode(target, a->width, a->height, a->bits_per_pixel);
     a->refresh_hz = (uint16_t)target;
     return 1;

@@ -2,12 +2,10 @@
 // rate lists and the refresh rate it programs.
 #include "modes/mode_keys.h"
 
-#include <stdio.h>
-#include <stdlib.h>
-#include <string.h>
 #include <windows.h>
 
 #include "base/number.h"
+#include "base/runtime.h"
 #include "hardware/driver_key.h"
 #include "hardware/registry_text.h"
 
@@ -17,13 +15,13 @@ enum { VALUE_TEXT_SIZE = 80 };
 // a rate counts as no value.
 static int StoredRate(const char* text)
 {
-    int32_t hz = ParseNumber(text, strlen(text));
+    int32_t hz = ParseNumber(text, TextLength(text));
     return FitsRate(hz) ? hz : -1;
 }
 
 static void ModeKeyPath(int width, int height, int bits, char* out, size_t size)
 {
-    snprintf(out, size, "\\MODES\\%d\\%d,%d", bits, width, height);
+    FormatText(out, size, "\\MODES\\%d\\%d,%d", bits, width, height);
 }
 
 // One MODES key's list text; 0 when missing, empty or too long.
@@ -52,7 +50,7 @@ int ModeKeyRefresh(int width, int height, int bits, int write, int value)
     ModeKeyPath(width, height, bits, subkey, sizeof subkey);
     if (write) {
         char text[16];
-        int length = snprintf(text, sizeof text, "%d", value);
+        int length = FormatText(text, sizeof text, "%d", value);
         // The display driver reads this key as Windows writes it: terminated.
         return DriverKeyValue(subkey, "RefreshRate", text, (uint32_t)length + 1, REG_SZ, 0) == 1 ? 1 : -1;
     }

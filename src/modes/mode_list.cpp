@@ -2,15 +2,12 @@
 // effect, for the current adapter.
 #include "modes/mode_list.h"
 
-#include <math.h>
-#include <stdio.h>
-#include <stdlib.h>
-#include <string.h>
 #include <windows.h>
 
 #include "base/adapters.h"
 #include "base/module_reset.h"
 #include "base/number.h"
+#include "base/runtime.h"
 #include "base/settings.h"
 #include "base/state.h"
 #include "chips/chips.h"
@@ -77,9 +74,9 @@ static int OsRate(const ModeKey* mode, int index, int* count)
 static int ChipListRate(const ModeKey* mode, const char* suffix, int index, int* count)
 {
     char section[32], key[32], text[RATE_LIST_TEXT_SIZE];
-    snprintf(section, sizeof section, platform == PLATFORM_NT ? "CHIP%04x_NT4%s" : "CHIP%04x_95%s",
-             CurrentAdapter()->device_id, suffix);
-    snprintf(key, sizeof key, "%dx%dx%d", mode->width, mode->height, mode->bits);
+    FormatText(section, sizeof section, platform == PLATFORM_NT ? "CHIP%04x_NT4%s" : "CHIP%04x_95%s",
+               CurrentAdapter()->device_id, suffix);
+    FormatText(key, sizeof key, "%dx%dx%d", mode->width, mode->height, mode->bits);
     GetPrivateProfileStringA(section, key, "", text, sizeof text, chip_ini_path);
     if (!text[0]) return NO_LIST;
     return TextRate(text, index, count);
@@ -117,9 +114,9 @@ static bool CollectNtRate(const ListedMode* m, void* data)
 static bool ReadChipList(const ModeKey* mode, const char* suffix, char* text, DWORD size)
 {
     char section[32], key[32];
-    snprintf(section, sizeof section, platform == PLATFORM_NT ? "CHIP%04x_NT4%s" : "CHIP%04x_95%s",
-             CurrentAdapter()->device_id, suffix);
-    snprintf(key, sizeof key, "%dx%dx%d", mode->width, mode->height, mode->bits);
+    FormatText(section, sizeof section, platform == PLATFORM_NT ? "CHIP%04x_NT4%s" : "CHIP%04x_95%s",
+               CurrentAdapter()->device_id, suffix);
+    FormatText(key, sizeof key, "%dx%dx%d", mode->width, mode->height, mode->bits);
     GetPrivateProfileStringA(section, key, "", text, size, chip_ini_path);
     return text[0] != 0;
 }
@@ -255,12 +252,12 @@ int MeasuredRefreshRate()
     chip_close_io();
     uint32_t clocks_per_frame = c * v * h;
     if (!clocks_per_frame) return 0;
-    return NearestListedRefresh((int)trunc(pixel_clock / clocks_per_frame));
+    return NearestListedRefresh((int)(pixel_clock / clocks_per_frame));
 }
 
 void FreeModeTable()
 {
-    free(mode_table);
+    FreeMemory(mode_table);
     mode_table = NULL;
 }
 VISTREL_MODULE_RESET(FreeModeTable);
@@ -310,7 +307,7 @@ static void SortModeTable(int count)
 int BuildModeTable(int include_15bit)
 {
     FreeModeTable();
-    mode_table = (ModeEntry*)calloc(MODE_TABLE_SIZE, sizeof(ModeEntry));
+    mode_table = (ModeEntry*)AllocZeroed(MODE_TABLE_SIZE * sizeof(ModeEntry));
     if (!mode_table) return 1;
     TableBuild build = {include_15bit, 0};
     ForEachListedMode(CollectMode, &build);

@@ -1,14 +1,13 @@
 #include "modes/rate_list.h"
 
-#include <string.h>
-
 #include "base/number.h"
+#include "base/runtime.h"
 
 // An item runs to the next comma or the end; a number too large to be a
 // rate reads as no rate.
 static int RateItem(const char* item)
 {
-    int32_t hz = ParseNumber(item, strlen(item));
+    int32_t hz = ParseNumber(item, TextLength(item));
     return FitsRate(hz) ? hz : 0;
 }
 
@@ -17,13 +16,13 @@ int ParseRateList(const char* text, int index)
     if (!text || !text[0]) return 0;
     const char* item = text;
     if (index == RATE_LAST) {
-        const char* comma = strrchr(text, ',');
+        const char* comma = FindLastChar(text, ',');
         if (comma) item = comma + 1;
         return RateItem(item);
     }
     if (index < 0) return 0;
     for (int k = 0; k < index; ++k) {
-        item = strchr(item, ',');
+        item = FindChar(item, ',');
         if (!item) return 0;
         ++item;
     }

@@ -1,9 +1,8 @@
 #include "shell/startup.h"
 
-#include <string.h>
-
 #include "adjust/adjust_window.h"
 #include "base/protocol.h"
+#include "base/runtime.h"
 #include "base/settings.h"
 #include "base/state.h"
 #include "shell/main_window.h"
@@ -18,7 +17,7 @@ static const WORD win95_osr_build = 1111;
 uint32_t ParseStartupSwitch(const char* command_line)
 {
     if (!command_line) return 0;
-    const char* slash = strchr(command_line, '/');
+    const char* slash = FindChar(command_line, '/');
     if (slash && (slash[1] == 'A' || slash[1] == 'a')) return STARTUP_AUTORUN;
     return 0;
 }
@@ -118,14 +117,14 @@ static const char chip_ini_name[] = "ZNTR3.INI";
 static void BuildIniPath(char* out, const char* module_path, size_t folder_length, const char* name)
 {
     out[0] = 0;
-    if (folder_length + strlen(name) > INI_PATH_SIZE - 1) return;
+    if (folder_length + TextLength(name) > INI_PATH_SIZE - 1) return;
     memcpy(out, module_path, folder_length);
-    strcpy(out + folder_length, name);
+    CopyText(out + folder_length, INI_PATH_SIZE - folder_length, name);
 }
 
 void BuildIniPaths(const char* module_path)
 {
-    const char* last = strrchr(module_path, '\\');
+    const char* last = FindLastChar(module_path, '\\');
     size_t folder_length = last ? (size_t)(last - module_path) + 1 : 0;
     BuildIniPath(text_ini_path, module_path, folder_length, text_ini_name);
     BuildIniPath(chip_ini_path, module_path, folder_length, chip_ini_name);

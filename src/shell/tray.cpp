@@ -1,8 +1,8 @@
 #include "shell/tray.h"
 
 #include <shellapi.h>
-#include <string.h>
 
+#include "base/runtime.h"
 #include "base/state.h"
 
 #if defined(__i386__)
