@@ -8,7 +8,7 @@
 typedef void (*ModuleResetFn)();
 
 #ifdef VISTREL_PRODUCT
-#define VISTREL_MODULE_RESET(fn)
+#define VISTREL_MODULE_RESET(fn) static_assert(sizeof(&fn) > 0, "a reset")
 #else
 struct ModuleResetEntry {
     explicit ModuleResetEntry(ModuleResetFn fn);

@@ -44,14 +44,6 @@ int memcmp(const void* a, const void* b, size_t size)
     return 0;
 }
 
-// Until the clock code rounds without it: whole doubles toward zero. From
-// 2^52 on every double is whole already, and NaN stays NaN.
-double trunc(double x)
-{
-    if (!(x > -4503599627370496.0 && x < 4503599627370496.0)) return x;
-    return (double)(long long)x;
-}
-
 size_t TextLength(const char* text) { return (size_t)lstrlenA(text); }
 
 void CopyText(char* out, size_t size, const char* text)
@@ -142,16 +134,6 @@ const char* SkipProgramName(const char* command_line)
     return (const char*)s;
 }
 
-// The linker's list of static constructors: -1, the constructors, 0. The
-// S3 pixel clock limits are the one entry, until their crystal is a
-// constant the compiler sees.
-extern void (*__CTOR_LIST__[])();
-
-static void RunConstructors()
-{
-    for (void (**constructor)() = __CTOR_LIST__ + 1; *constructor; ++constructor) (*constructor)();
-}
-
 // Where vistrel.exe and gatectl.exe start: WinMain gets what a C runtime's
 // start-up would give it, and its answer ends the process.
 void ProgramEntry()
@@ -159,7 +141,6 @@ void ProgramEntry()
     // The FPU as the programs have always run: all 64 bits of precision,
     // every exception masked.
     __asm__ __volatile__("fninit");
-    RunConstructors();
     STARTUPINFOA start;
     start.dwFlags = 0;
     GetStartupInfoA(&start);

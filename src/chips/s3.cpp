@@ -1,9 +1,6 @@
 // The S3 family: Trio32/64/64V2, Trio3D and Trio3D/2X, ViRGE, ViRGE/VX,
 // DX/GX, GX2 and Savage3D, all through the VGA sequencer and CRT controller
 // and the S3 extensions behind them.
-#include <math.h>
-#include <string.h>
-
 #include "base/adapters.h"
 #include "base/state.h"
 #include "chips/chip_io.h"
@@ -266,7 +263,7 @@ static void CommitClock(const S3ClockFields* f, SynthSetting s)
     if (f->screen_off) WriteSeq(SR01_CLOCKING, clocking);
 }
 
-static uint32_t WholeMegahertz(double hz) { return (uint32_t)trunc(hz / 1e6 + 0.5); }
+static uint32_t WholeMegahertz(double hz) { return (uint32_t)(hz / 1e6 + 0.5); }
 
 static uint32_t GetMemoryClock()
 {

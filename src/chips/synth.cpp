@@ -1,7 +1,5 @@
 #include "chips/synth.h"
 
-#include <math.h>
-
 double SynthFrequency(const SynthLimits* limits, SynthSetting s)
 {
     return limits->fref_hz * (s.m + limits->a) / ((double)(s.n + limits->b) * (double)(1u << s.r));
@@ -11,8 +9,10 @@ double SynthFrequency(const SynthLimits* limits, SynthSetting s)
 // low that the product falls below a wraps around to a huge M.
 static uint16_t MultiplierFor(const SynthLimits* limits, double target, uint16_t n, uint16_t r)
 {
-    double product = trunc((double)(1u << r) * (n + limits->b) * target / limits->fref_hz);
-    uint32_t whole = product >= 0 && product < 4294967296.0 ? (uint32_t)product : 0xFFFFFFFFu;
+    // Truncated toward zero; what lies beyond 32 bits, or at -1 and below,
+    // stands for a huge M.
+    double product = (double)(1u << r) * (n + limits->b) * target / limits->fref_hz;
+    uint32_t whole = product > -1.0 && product < 4294967296.0 ? (uint32_t)(product < 0 ? 0.0 : product) : 0xFFFFFFFFu;
     return (uint16_t)((uint16_t)whole - (uint16_t)limits->a);
 }
 

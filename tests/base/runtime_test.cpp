@@ -188,15 +188,6 @@ TEST(Runtime, Memory)
     WIN32_BODY(FreeMemory)(NULL);
 }
 
-// The clock code still asks for trunc, which the product body provides.
-TEST(Runtime, WholeDoubles)
-{
-    auto whole = (double (*)(double))GetProcAddress(Win32Dll(), "trunc");
-    for (double x : {0.0, 0.49, 0.5, 2.5, -1.5, 45.0 + 0.5, 57.272727 + 0.5, 4503599627370495.5, 4503599627370497.0,
-                     1e300, -1e300})
-        EXPECT_EQ(trunc(x), whole(x)) << x;
-}
-
 // The process entry hands WinMain the command line without the program name.
 TEST(Runtime, ProgramNameSkippedAsTheRuntimeSkipsIt)
 {
