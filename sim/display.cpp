@@ -251,7 +251,7 @@ SimModeLimits DisplayCardLimits(int card)
     const SimCardConfig* c = &sim->config.cards[card];
     SimModeLimits limits;
     limits.memory_bytes = (uint64_t)c->memory_mb * 1024 * 1024 + (uint64_t)c->memory_extra_kb * 1024;
-    memcpy(limits.max_pixel_khz, chip->max_pixel_khz, sizeof limits.max_pixel_khz);
+    memcpy(limits.max_pixel_hz, chip->max_pixel_hz, sizeof limits.max_pixel_hz);
     limits.has_15bit = chip->has_15bit;
     return limits;
 }
@@ -321,6 +321,16 @@ void DisplayDetachProcess()
 {
     if (driver_window) DestroyWindow(driver_window);
     driver_window = NULL;
+}
+
+int SimSetCardMode(int card, int width, int height, int bits, int frequency)
+{
+    if (!sim || !SimCardValid(card)) return 0;
+    SimModeLimits limits = DisplayCardLimits(card);
+    if (!SimModeOffered(&limits, width, height, bits)) return 0;
+    if (IsNt() && !FrequencyOffered(card, width, height, bits, frequency)) return 0;
+    SetCardMode(card, width, height, bits, frequency, IsNt() && frequency > 1 && frequency < 50);
+    return 1;
 }
 
 void SimSetModeList(const SimListedMode* modes, int count)
@@ -397,9 +407,10 @@ LONG MachineChangeDisplaySettings(DEVMODEA* mode, DWORD flags)
 }
 
 // GetDeviceCaps(VREFRESH): what the card's registers give, named by the
-// rate of the driver's list it lies within 1 Hz of (a VESA 72 Hz timing runs
-// at 72.8 Hz), else rounded; an NT miniport reports 1 for the hardware
-// default it was asked for.
+// nominal rate of the timing the driver set, or of the driver's list, when
+// it lies within 1 Hz of it (a VESA 72 Hz timing runs at 72.8 Hz), else
+// rounded; an NT miniport reports 1 for the hardware default it was asked
+// for.
 int MachineScreenRefresh()
 {
     if (!sim) {
@@ -413,7 +424,7 @@ int MachineScreenRefresh()
     const SimDriverMode* m = &sim->cards[card].mode;
     if (IsNt() && m->requested <= 1) return 1;
     double hz = SimRefreshHz(card);
-    if (hz <= 0) return m->refresh;
+    if (hz <= 0 || fabs(hz - m->refresh) < 1.0) return m->refresh;
     SimModeLimits limits = DisplayCardLimits(card);
     uint16_t rates[SIM_MAX_RATES];
     int n = SimModeRates(&limits, m->width, m->height, m->bits, rates);

@@ -88,8 +88,8 @@ struct SimChip {
     // port p at offset window_offset + p of base address register window_bar.
     int8_t window_bar;  // -1: the family decodes its window itself, or has none
     uint32_t window_offset;
-    // Highest pixel rate the RAMDAC drives at 8, 15/16 and 32 bits, in kHz.
-    uint32_t max_pixel_khz[3];
+    // Highest pixel rate the RAMDAC drives at 8, 15/16 and 32 bits, Hz.
+    uint32_t max_pixel_hz[3];
     bool has_15bit;
     const char* driver_desc;  // DriverDesc / Device Description
     const char* driver_file;  // 9x DEFAULT "drv"; NT display DLL (base name + ".dll")
@@ -101,6 +101,8 @@ const SimChip* SimFindChip(uint16_t vendor_id, uint16_t device_id);  // never NU
 const SimChip* SimCardChip(int card);
 
 // --- the chip families: what is not plain VGA ---
+// Every definition names its members (designated initializers): several
+// have the same type, and a swapped pair would still compile.
 
 struct SimFamilyOps {
     void (*reset)(int card);
@@ -113,11 +115,11 @@ struct SimFamilyOps {
     // window: 1 when the family decodes it.
     int (*window_read)(int card, int bar, uint32_t offset, uint8_t* value);
     int (*window_write)(int card, int bar, uint32_t offset, uint8_t value);
-    double (*pixel_clock_hz)(int card);
-    double (*memory_clock_hz)(int card);
-    int (*htotal)(int card);
-    int (*vtotal)(int card);
-    double (*refresh_hz)(int card);
+    double (*pixel_clock_hz)(int card);   // the dot clock MISC selects, Hz
+    double (*memory_clock_hz)(int card);  // Hz
+    int (*htotal)(int card);              // character clocks per line
+    int (*vtotal)(int card);              // lines per field
+    double (*refresh_hz)(int card);       // frames per second, Hz
     SimDpms (*dpms)(int card);
     // The display driver's mode set: CRT timing, depth and pixel clock.
     void (*program_mode)(int card, const struct SimTiming* timing, int bits);
@@ -138,10 +140,10 @@ struct SimCrtcTiming {
     int htotal, hdisplay_end, hblank_start, hblank_end, hsync_start, hsync_end;
     int vtotal, vdisplay_end, vblank_start, vblank_end, vsync_start, vsync_end;
 };
-// Writes the standard VGA bits of the fields (8 horizontal, 10 vertical)
-// and leaves CR11 bit 7 set, as a mode set by the BIOS or a driver does; the
-// families add their overflow bits.
-void VgaWriteTiming(int card, const SimCrtcTiming* t);
+// Writes the values into the fields of a table (the VGA's own, or a
+// family's with its overflow bits) and leaves CR11 bit 7 set, as a mode set
+// by the BIOS or a driver does.
+void VgaWriteTiming(int card, const SimCrtcTiming* t, const struct SimCrtcFields* fields);
 
 // --- pci.cpp ---
 void PciReset();

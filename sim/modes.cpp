@@ -20,7 +20,7 @@ const int sim_desktop_depth_count = sizeof sim_desktop_depths / sizeof sim_deskt
 
 double SimTimingFrameRate(const SimTiming* timing)
 {
-    return timing->pixel_khz * 1000.0 / ((double)timing->htotal * timing->vtotal);
+    return timing->pixel_hz / ((double)timing->htotal * timing->vtotal);
 }
 
 const SimTiming* SimFindTiming(int width, int height, int refresh, bool interlaced)
@@ -49,7 +49,7 @@ static bool TimingFits(const SimModeLimits* limits, const SimTiming* t, int bits
     int slot = DepthSlot(bits);
     if (slot < 0 || (bits == 15 && !limits->has_15bit)) return false;
     uint64_t bytes = (uint64_t)t->width * t->height * ((bits + 7) / 8);
-    return bytes <= limits->memory_bytes && t->pixel_khz <= limits->max_pixel_khz[slot];
+    return bytes <= limits->memory_bytes && t->pixel_hz <= limits->max_pixel_hz[slot];
 }
 
 static bool IsDesktopSize(int width, int height)

@@ -13,7 +13,7 @@ enum { SIM_TIMING_INTERLACED = 1, SIM_TIMING_HSYNC_NEGATIVE = 2, SIM_TIMING_VSYN
 // interlaced timing, lines of the whole frame).
 struct SimTiming {
     uint16_t width, height, refresh;  // refresh: the nominal rate (43 for 1024x768 interlaced)
-    uint32_t pixel_khz;
+    uint32_t pixel_hz;
     uint16_t hsync_start, hsync_end, htotal;
     uint16_t vsync_start, vsync_end, vtotal;
     uint8_t flags;
@@ -29,7 +29,7 @@ const SimTiming* SimFindTiming(int width, int height, int refresh, bool interlac
 // What limits the modes of a card.
 struct SimModeLimits {
     uint64_t memory_bytes;
-    uint32_t max_pixel_khz[3];  // at 8, 15/16 and 32 bits
+    uint32_t max_pixel_hz[3];  // at 8, 15/16 and 32 bits
     bool has_15bit;
 };
 

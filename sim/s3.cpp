@@ -1,38 +1,25 @@
 // The S3 chips (Trio, ViRGE, Trio3D, Savage3D): extended sequencer behind
 // the SR08 key, the DCLK and MCLK synthesizers, the extended CRT timing
-// bits, the memory straps and the DPMS sync control. Field layouts follow
-// the program's register table; sim/README.md lists where public documents
-// of the chips say otherwise.
-#include <math.h>
-
+// bits, the memory straps and the DPMS sync control, and the display
+// driver's mode set. The model reads line length, clocks and refresh from
+// its registers through the field tables of fields.cpp; sim/README.md lists
+// where public documents of the chips and the program's register
+// description differ, and which one the model follows.
+#include "fields.h"
 #include "machine_state.h"
 #include "modes.h"
 
 namespace {
 
 const double fref_hz = 14318180.0;
-
-// Register fields.
-enum {
-    SR08_KEY_MASK = 0x0F,
-    SR08_UNLOCKED = 0x06,          // SR09 and above answer only with this key
-    SR0D_HSYNC_MASK = 0x30,        // hsync off when non-zero
-    SR0D_VSYNC_MASK = 0xC0,        // vsync off when non-zero
-    SR18_DOUBLE_CLOCK = 0x80,      // two DCLK periods per pixel above 8 bits per pixel
-    SR29_M_BIT8 = 0x08, SR29_N_BIT6 = 0x10, SR29_R_BIT2 = 0x04,
-    CR42_INTERLACED = 0x20,
-    CR43_DOUBLE_HORIZONTAL = 0x80,
-    CR37_AGP = 0x40,
-    MISC_CLOCK_SELECT = 0x0C,
-    MISC_HSYNC_NEGATIVE = 0x40,
-    MISC_VSYNC_NEGATIVE = 0x80,
-};
+const double vga_clock_hz[2] = {25175000.0, 28322000.0};  // MISC clock select 0 and 1
+enum { SR08_UNLOCKED = 0x06 };  // SR09 and above answer only with this key
 
 SimVga* Core(int card) { return &sim->cards[card].vga; }
 const SimS3Chip* Chip(int card) { return SimCardChip(card)->s3; }
 bool IsSavage(int card) { return Chip(card)->dclk == S3_DCLK_SAVAGE; }
-bool Unlocked(int card) { return (Core(card)->sr[0x08] & SR08_KEY_MASK) == SR08_UNLOCKED; }
-int Bit(uint8_t reg, int bit) { return (reg >> bit) & 1; }
+const SimCrtcFields* Crtc(int card) { return IsSavage(card) ? &sim_savage_crtc : &sim_s3_crtc; }
+bool Unlocked(int card) { return SimFieldRead(Core(card)->sr, &sim_s3.unlock_key) == SR08_UNLOCKED; }
 
 uint8_t ReadSr(int card, uint8_t index)
 {
@@ -59,111 +46,104 @@ SimPllLimits DclkLimits(int card)
     return {fref_hz, 2, 2, 1, c->m_max, c->n_min, c->n_max, 0, c->r_max, c->vco_min_hz, c->vco_max_hz};
 }
 
-void DecodeDclk(int card, int* m, int* n, int* r)
+// Where M, N and R of the DCLK synthesizer live on the chip.
+struct DclkFields {
+    const SimField *m, *n, *r;
+};
+DclkFields DclkLayout(int card)
 {
-    const uint8_t* sr = Core(card)->sr;
     switch (Chip(card)->dclk) {
-    case S3_DCLK_SAVAGE:
-        *m = sr[0x13] + 256 * Bit(sr[0x29], 3);
-        *n = (sr[0x12] & 0x3F) + 64 * Bit(sr[0x29], 4);
-        *r = (sr[0x12] >> 6) + 4 * Bit(sr[0x29], 2);
-        break;
-    case S3_DCLK_R2:
-        *m = sr[0x13] & 0x7F;
-        *n = sr[0x12] & 0x1F;
-        *r = (sr[0x12] >> 5) & 3;
-        break;
-    case S3_DCLK_R3:
-        *m = sr[0x13] & 0x7F;
-        *n = sr[0x12] & 0x1F;
-        *r = (sr[0x12] >> 5) & 7;
-        break;
+    case S3_DCLK_SAVAGE: return {&sim_s3.savage_dclk_m, &sim_s3.savage_dclk_n, &sim_s3.savage_dclk_r};
+    case S3_DCLK_R2: return {&sim_s3.dclk_m, &sim_s3.dclk_n, &sim_s3.dclk_r2};
+    default: return {&sim_s3.dclk_m, &sim_s3.dclk_n, &sim_s3.dclk_r3};
     }
 }
 
-void EncodeDclk(int card, int m, int n, int r)
+void EncodeDclk(int card, const SimPllSetting* pll)
 {
     uint8_t* sr = Core(card)->sr;
-    switch (Chip(card)->dclk) {
-    case S3_DCLK_SAVAGE:
-        sr[0x29] = (uint8_t)((sr[0x29] & 0xE3) | (m >= 256 ? SR29_M_BIT8 : 0) | (n >= 64 ? SR29_N_BIT6 : 0) |
-                             (r >= 4 ? SR29_R_BIT2 : 0));
-        sr[0x13] = (uint8_t)(m & 0xFF);
-        sr[0x12] = (uint8_t)((n & 0x3F) | ((r & 3) << 6));
-        break;
-    case S3_DCLK_R2:
-        sr[0x13] = (uint8_t)((sr[0x13] & 0x80) | m);
-        sr[0x12] = (uint8_t)((sr[0x12] & 0x80) | n | (r << 5));
-        break;
-    case S3_DCLK_R3:
-        sr[0x13] = (uint8_t)((sr[0x13] & 0x80) | m);
-        sr[0x12] = (uint8_t)(n | (r << 5));
-        break;
+    DclkFields f = DclkLayout(card);
+    SimFieldWrite(sr, f.m, pll->m);
+    SimFieldWrite(sr, f.n, pll->n);
+    SimFieldWrite(sr, f.r, pll->r);
+}
+
+double SynthesizerHz(const uint8_t* sr, const SimField* m, const SimField* n, const SimField* r)
+{
+    return fref_hz * (SimFieldRead(sr, m) + 2) / ((double)(SimFieldRead(sr, n) + 2) * (1 << SimFieldRead(sr, r)));
+}
+
+// The dot clock: MISC selects one of the two fixed VGA clocks or the DCLK
+// synthesizer.
+double DotClock(int card)
+{
+    const SimVga* v = Core(card);
+    int select = SimFieldRead(&v->misc, &sim_misc_clock_select);
+    if (select < 2) return vga_clock_hz[select];
+    DclkFields f = DclkLayout(card);
+    return SynthesizerHz(v->sr, f.m, f.n, f.r);
+}
+
+double MemoryClock(int card) { return SynthesizerHz(Core(card)->sr, &sim_s3.mclk_m, &sim_s3.mclk_n, &sim_s3.mclk_r); }
+
+// Bits per pixel from the colour mode in CR67 7..4: 0 and 1 are 8 bits (1
+// with two pixels a clock), 2 and 3 15 bits, 4 and 5 16 bits, 7 24 bits,
+// 13 32 bits (24 on the ViRGE/VX).
+int Depth(int card)
+{
+    switch (SimFieldRead(Core(card)->cr, &sim_s3.color_mode)) {
+    case 0x2: case 0x3: return 15;
+    case 0x4: case 0x5: return 16;
+    case 0x7: return 24;
+    case 0xD: return 32;
+    default: return 8;
     }
 }
+bool HighColour(int card) { return Depth(card) == 15 || Depth(card) == 16; }
 
-int Depth(int card) { return sim->cards[card].mode.bits ? sim->cards[card].mode.bits : 8; }
-int CharWidth(int card) { return Depth(card) == 15 || Depth(card) == 16 ? 4 : 8; }
-
-double SynthesizerHz(int card)
-{
-    int m = 0, n = 0, r = 0;
-    DecodeDclk(card, &m, &n, &r);
-    return fref_hz * (m + 2) / ((double)(n + 2) * (1 << r));
-}
-
-// The dot clock the CRT controller sees: MISC selects one of the two fixed
-// VGA clocks or the DCLK synthesizer.
-double PixelClock(int card)
-{
-    switch ((Core(card)->misc & MISC_CLOCK_SELECT) >> 2) {
-    case 0: return 25175000.0;
-    case 1: return 28322000.0;
-    default: return SynthesizerHz(card);
-    }
-}
-
-double MemoryClock(int card)
-{
-    const uint8_t* sr = Core(card)->sr;
-    int m = sr[0x11] & 0x7F, n = sr[0x10] & 0x1F, r = (sr[0x10] >> 5) & 3;
-    return fref_hz * (m + 2) / ((double)(n + 2) * (1 << r));
-}
-
-int HTotal(int card)
+// The CRT controller's line in character clocks: the horizontal total
+// register plus 5. With CR43 bit 7 every unit of the register counts two
+// character clocks (the 5 of the retrace overhead stays single).
+int LineCharacters(int card)
 {
     const uint8_t* cr = Core(card)->cr;
-    int t = cr[0x00] + 256 * Bit(cr[0x5D], 0);
-    if (IsSavage(card)) t += 512 * (cr[0x5F] & 3);
-    if (cr[0x43] & CR43_DOUBLE_HORIZONTAL) t *= 2;
-    return t + 5;
+    int total = SimFieldRead(cr, &Crtc(card)->htotal);
+    int unit = SimFieldRead(cr, &sim_s3.horizontal_double) ? 2 : 1;
+    return unit * total + 5;
 }
 
-int VTotal(int card)
+// Lines of a field: the vertical total register plus 2.
+int FieldLines(int card) { return SimFieldRead(Core(card)->cr, &Crtc(card)->vtotal) + 2; }
+
+// A character clock spans 8 or 9 pixels (SR01 bit 0); at 15 and 16 bits
+// per pixel, two bytes each, half as many.
+double PixelsPerCharacter(int card)
 {
-    const uint8_t* cr = Core(card)->cr;
-    return cr[0x06] + 256 * Bit(cr[0x07], 0) + 512 * Bit(cr[0x07], 5) + 1024 * Bit(cr[0x5E], 0) + 2;
+    int dots = SimFieldRead(Core(card)->sr, &sim_sr01_eight_dots) ? 8 : 9;
+    return HighColour(card) ? dots / 2.0 : dots;
 }
 
-// The pixel clock as the CRT timing counts it: half the DCLK when a deeper
-// mode takes two DCLK periods per pixel.
-double TimingClock(int card)
+// SR18 bit 7 above 8 bits per pixel: a pixel takes two periods of the dot
+// clock.
+int ClocksPerPixel(int card)
 {
-    double f = PixelClock(card);
-    if (Depth(card) != 8 && (Core(card)->sr[0x18] & SR18_DOUBLE_CLOCK)) f /= 2;
-    return f;
+    return Depth(card) > 8 && SimFieldRead(Core(card)->sr, &sim_s3.pixel_doubling) ? 2 : 1;
 }
 
 double Refresh(int card)
 {
-    double per_field = TimingClock(card) / ((double)CharWidth(card) * HTotal(card) * VTotal(card));
-    return (Core(card)->cr[0x42] & CR42_INTERLACED) ? per_field / 2 : per_field;
+    double pixel_hz = DotClock(card) / ClocksPerPixel(card);
+    double line_hz = pixel_hz / (LineCharacters(card) * PixelsPerCharacter(card));
+    double field_hz = line_hz / FieldLines(card);
+    // Interlaced: a frame is two fields.
+    return SimFieldRead(Core(card)->cr, &sim_s3.interlaced) ? field_hz / 2 : field_hz;
 }
 
 SimDpms Dpms(int card)
 {
-    uint8_t sr0d = Core(card)->sr[0x0D];
-    bool hsync_off = (sr0d & SR0D_HSYNC_MASK) != 0, vsync_off = (sr0d & SR0D_VSYNC_MASK) != 0;
+    const uint8_t* sr = Core(card)->sr;
+    bool hsync_off = SimFieldRead(sr, &sim_s3.dpms_hsync_off) != 0;
+    bool vsync_off = SimFieldRead(sr, &sim_s3.dpms_vsync_off) != 0;
     if (hsync_off && vsync_off) return SIM_DPMS_OFF;
     if (hsync_off) return SIM_DPMS_STANDBY;
     if (vsync_off) return SIM_DPMS_SUSPEND;
@@ -171,21 +151,17 @@ SimDpms Dpms(int card)
 }
 
 // CR36 bits 7..5 as the straps set them for the card's memory.
-uint8_t MemoryStraps(int card)
+int MemoryStraps(int card)
 {
-    const SimCardConfig* c = &sim->config.cards[card];
-    uint32_t mb = c->memory_mb;
-    int code = 0;
+    uint32_t mb = sim->config.cards[card].memory_mb;
     switch (Chip(card)->memory_code) {
-    case S3_MEM_SAVAGE: code = mb >= 8 ? 0 : mb >= 4 ? 2 : 6; break;
-    case S3_MEM_VIRGE_VX: code = mb >= 8 ? 3 : mb >= 6 ? 2 : mb >= 4 ? 1 : 0; break;
-    case S3_MEM_TRIO:
+    case S3_MEM_SAVAGE: return mb >= 8 ? 0 : mb >= 4 ? 2 : 6;
+    case S3_MEM_VIRGE_VX: return mb >= 8 ? 3 : mb >= 6 ? 2 : mb >= 4 ? 1 : 0;
+    default:
         // 8 MB and 3 MB have codes on the chips (3 and 2) that the program's
         // table does not know; 3 MB then reads as 4.
-        code = mb >= 8 ? 3 : mb >= 4 ? 0 : mb >= 3 ? 2 : mb >= 2 ? 4 : 6;
-        break;
+        return mb >= 8 ? 3 : mb >= 4 ? 0 : mb >= 3 ? 2 : mb >= 2 ? 4 : 6;
     }
-    return (uint8_t)(code << 5);
 }
 
 void Reset(int card)
@@ -198,113 +174,111 @@ void Reset(int card)
     v->cr[0x2E] = (uint8_t)c->device_id;
     v->cr[0x2F] = chip->revision;
     v->cr[0x30] = chip->s3->cr30_chip_id;
-    v->cr[0x36] = (uint8_t)(MemoryStraps(card) | 0x0E);
-    v->cr[0x37] = (uint8_t)((IsSavage(card) && c->bus == 1) ? CR37_AGP : 0);
+    v->cr[0x36] = 0x0E;
+    SimFieldWrite(v->cr, &sim_s3.memory_straps, MemoryStraps(card));
+    SimFieldWrite(v->cr, &sim_s3.agp_card, IsSavage(card) && c->bus == 1);
     // MCLK about 60 MHz: M = 115, N = 12, R = 1.
-    v->sr[0x10] = 0x2C;
-    v->sr[0x11] = 0x73;
+    SimFieldWrite(v->sr, &sim_s3.mclk_m, 115);
+    SimFieldWrite(v->sr, &sim_s3.mclk_n, 12);
+    SimFieldWrite(v->sr, &sim_s3.mclk_r, 1);
     SimPllLimits limits = DclkLimits(card);
     SimPllSetting pll;
-    if (SimPllBest(&limits, 25175000.0, &pll)) EncodeDclk(card, pll.m, pll.n, pll.r);
+    if (SimPllBest(&limits, vga_clock_hz[0], &pll)) EncodeDclk(card, &pll);
 }
 
-// The clock that makes a horizontal total (in characters) and a vertical
-// total (in lines) run at the timing's own rate, per field.
-double TimingClockFor(const SimTiming* t, int char_width, int htotal, int vtotal)
+// --- the display driver's mode set ---
+
+// What a depth asks of the pixel path.
+struct DepthSetting {
+    int pixels_per_character;  // 4 at 15/16 bits
+    int total_unit;            // character clocks per unit of the horizontal total (CR43 bit 7)
+    int clocks_per_pixel;      // DCLK periods per pixel (SR18 bit 7)
+    int color_mode;            // CR67 7..4
+};
+
+DepthSetting SettingFor(int card, int bits)
 {
-    double field_rate = SimTimingFrameRate(t) * ((t->flags & SIM_TIMING_INTERLACED) ? 2 : 1);
-    return field_rate * char_width * htotal * vtotal;
+    bool high_colour = bits == 15 || bits == 16;
+    // On the Trio32/64, Trio64V2, ViRGE, ViRGE/DX-GX and Trio3D a 15/16-bit
+    // pixel takes two DCLK periods.
+    int clocks = high_colour && Chip(card)->doubles_clock_16 ? 2 : 1;
+    int color_mode = bits == 8 ? 0x0 : bits == 15 ? 0x3 : bits == 16 ? 0x5 : 0xD;
+    return {.pixels_per_character = high_colour ? 4 : 8,
+            .total_unit = high_colour ? 2 : 1,
+            .clocks_per_pixel = clocks,
+            .color_mode = color_mode};
 }
 
-int FieldLines(const SimTiming* t) { return (t->flags & SIM_TIMING_INTERLACED) ? t->vtotal / 2 : t->vtotal; }
-
-// The horizontal total register value nearest the timing's total that the
-// synthesizer can clock closest to the timing's rate.
-int ChooseHTotal(int card, const SimTiming* t, int char_width, int h_factor, bool double_clock)
+// The CRT values of a VESA timing: horizontal ones in characters of 8
+// pixels, the total in the depth's characters (rounded half up), vertical
+// ones in lines of a field.
+SimCrtcTiming CrtcValues(const SimTiming* t, const DepthSetting* d)
 {
-    double exact = (t->htotal / (double)char_width - 5) / h_factor;
-    SimPllLimits limits = DclkLimits(card);
-    int best = (int)floor(exact + 0.5);
-    double best_error = -1;
-    for (int reg = (int)floor(exact); reg <= (int)floor(exact) + 1; reg++) {
-        double wanted = TimingClockFor(t, char_width, reg * h_factor + 5, FieldLines(t)) * (double_clock ? 2 : 1);
-        SimPllSetting pll;
-        if (!SimPllBest(&limits, wanted, &pll)) continue;
-        double error = fabs(SimPllOutput(&limits, pll.m, pll.n, pll.r) / wanted - 1);
-        if (best_error < 0 || error < best_error) {
-            best_error = error;
-            best = reg;
-        }
-    }
-    return best;
+    bool interlaced = (t->flags & SIM_TIMING_INTERLACED) != 0;
+    int div = interlaced ? 2 : 1;
+    int characters = (t->htotal + d->pixels_per_character / 2) / d->pixels_per_character;
+    int lines = t->vtotal / div, shown = t->height / div;
+    SimCrtcTiming c;
+    c.htotal = (characters - 5 + d->total_unit / 2) / d->total_unit;
+    c.hdisplay_end = t->width / 8 - 1;
+    c.hblank_start = t->width / 8;
+    c.hblank_end = t->htotal / 8 - 1;
+    c.hsync_start = t->hsync_start / 8;
+    c.hsync_end = t->hsync_end / 8;
+    c.vtotal = lines - 2;
+    c.vdisplay_end = shown - 1;
+    c.vblank_start = shown;
+    c.vblank_end = lines - 1;
+    c.vsync_start = t->vsync_start / div;
+    c.vsync_end = t->vsync_end / div;
+    return c;
 }
 
 void ProgramMode(int card, const SimTiming* t, int bits)
 {
     SimVga* v = Core(card);
-    uint8_t* cr = v->cr;
-    uint8_t* sr = v->sr;
-    bool high_colour = bits == 15 || bits == 16;
-    bool double_clock = high_colour && Chip(card)->doubles_clock_16;
-    bool interlaced = (t->flags & SIM_TIMING_INTERLACED) != 0;
-    int char_width = high_colour ? 4 : 8;
-    int h_factor = high_colour ? 2 : 1;  // CR43 bit 7 doubles the horizontal total
+    DepthSetting d = SettingFor(card, bits);
+    SimCrtcTiming c = CrtcValues(t, &d);
+    // The extended overflow registers are written whole.
+    v->cr[0x5D] = 0;
+    v->cr[0x5E] = 0;
+    VgaWriteTiming(card, &c, Crtc(card));
+    SimFieldWrite(v->cr, &sim_s3.interlaced, (t->flags & SIM_TIMING_INTERLACED) != 0);
+    SimFieldWrite(v->cr, &sim_s3.horizontal_double, d.total_unit == 2);
+    SimFieldWrite(v->cr, &sim_s3.offset, t->width * ((bits + 7) / 8) / 8);
+    SimFieldWrite(v->cr, &sim_s3.color_mode, d.color_mode);
+    SimFieldWrite(v->sr, &sim_s3.pixel_doubling, d.clocks_per_pixel == 2);
+    SimFieldWrite(v->sr, &sim_sr01_eight_dots, 1);
+    SimFieldWrite(&v->misc, &sim_misc_clock_select, 3);
+    SimFieldWrite(&v->misc, &sim_misc_hsync_negative, (t->flags & SIM_TIMING_HSYNC_NEGATIVE) != 0);
+    SimFieldWrite(&v->misc, &sim_misc_vsync_negative, (t->flags & SIM_TIMING_VSYNC_NEGATIVE) != 0);
 
-    // Horizontal registers count 8 pixels; the total is counted in
-    // characters of char_width pixels, of which CR43 makes two per unit.
-    SimCrtcTiming c;
-    c.htotal = ChooseHTotal(card, t, char_width, h_factor, double_clock);
-    c.hdisplay_end = t->width / 8 - 1;
-    c.hblank_start = t->width / 8;
-    c.hblank_end = (t->htotal / 8 - 1) & 0x3F;
-    c.hsync_start = t->hsync_start / 8;
-    c.hsync_end = (t->hsync_end / 8) & 0x1F;
-    int lines = FieldLines(t);
-    int shown = interlaced ? t->height / 2 : t->height;
-    c.vtotal = lines - 2;
-    c.vdisplay_end = shown - 1;
-    c.vblank_start = shown;
-    c.vblank_end = (lines - 1) & 0xFF;
-    c.vsync_start = interlaced ? t->vsync_start / 2 : t->vsync_start;
-    c.vsync_end = (interlaced ? t->vsync_end / 2 : t->vsync_end) & 0x0F;
-    VgaWriteTiming(card, &c);
-
-    cr[0x5D] = (uint8_t)(Bit((uint8_t)(c.htotal >> 8), 0) | (Bit((uint8_t)(c.hdisplay_end >> 8), 0) << 1) |
-                         (Bit((uint8_t)(c.hblank_start >> 8), 0) << 2) |
-                         (Bit((uint8_t)(c.hsync_start >> 8), 0) << 4));
-    if (IsSavage(card)) cr[0x5F] = (uint8_t)((cr[0x5F] & ~3) | ((c.htotal >> 9) & 3));
-    cr[0x5E] = (uint8_t)(((c.vtotal >> 10) & 1) | (((c.vdisplay_end >> 10) & 1) << 1) |
-                         (((c.vblank_start >> 10) & 1) << 2) | (((c.vsync_start >> 10) & 1) << 4) | 0x40);
-    cr[0x42] = (uint8_t)((cr[0x42] & ~CR42_INTERLACED) | (interlaced ? CR42_INTERLACED : 0));
-    cr[0x43] = (uint8_t)((cr[0x43] & ~CR43_DOUBLE_HORIZONTAL) | (high_colour ? CR43_DOUBLE_HORIZONTAL : 0));
-    int pitch = t->width * ((bits + 7) / 8) / 8;
-    cr[0x13] = (uint8_t)pitch;
-    cr[0x51] = (uint8_t)((cr[0x51] & 0xCF) | ((pitch >> 4) & 0x30));
-    static const uint8_t pixel_format[] = {0x00, 0x30, 0x50, 0xD0};  // CR67: 8, 15, 16, 32 bits
-    cr[0x67] = (uint8_t)((cr[0x67] & 0x0F) | pixel_format[bits == 8 ? 0 : bits == 15 ? 1 : bits == 16 ? 2 : 3]);
-    sr[0x18] = (uint8_t)((sr[0x18] & ~SR18_DOUBLE_CLOCK) | (double_clock ? SR18_DOUBLE_CLOCK : 0));
-    v->misc = (uint8_t)((v->misc & 0x3F & ~MISC_CLOCK_SELECT) | MISC_CLOCK_SELECT |
-                        ((t->flags & SIM_TIMING_HSYNC_NEGATIVE) ? MISC_HSYNC_NEGATIVE : 0) |
-                        ((t->flags & SIM_TIMING_VSYNC_NEGATIVE) ? MISC_VSYNC_NEGATIVE : 0));
-    sim->cards[card].mode.bits = (uint16_t)bits;
-
-    // The clock that makes the totals just programmed run at the timing's
-    // own rate (per field for an interlaced timing).
-    double timing_clock = TimingClockFor(t, char_width, HTotal(card), VTotal(card));
     SimPllLimits limits = DclkLimits(card);
     SimPllSetting pll;
-    if (SimPllBest(&limits, timing_clock * (double_clock ? 2 : 1), &pll)) {
+    if (SimPllBest(&limits, (double)t->pixel_hz * d.clocks_per_pixel, &pll)) {
         // A Savage3D blanks the screen while its synthesizer is rewritten.
-        uint8_t sr01 = sr[0x01];
-        if (IsSavage(card)) sr[0x01] |= 0x20;
-        EncodeDclk(card, pll.m, pll.n, pll.r);
-        sr[0x01] = sr01;
+        uint8_t sr01 = v->sr[0x01];
+        if (IsSavage(card)) SimFieldWrite(v->sr, &sim_sr01_screen_off, 1);
+        EncodeDclk(card, &pll);
+        v->sr[0x01] = sr01;
     }
 }
 
 }  // namespace
 
 const SimFamilyOps sim_s3_ops = {
-    Reset, ReadSr, WriteSr, VgaGenericReadCr, WriteCr, NULL, NULL, PixelClock, MemoryClock, HTotal, VTotal, Refresh,
-    Dpms, ProgramMode,
+    .reset = Reset,
+    .read_sr = ReadSr,
+    .write_sr = WriteSr,
+    .read_cr = VgaGenericReadCr,
+    .write_cr = WriteCr,
+    .window_read = NULL,
+    .window_write = NULL,
+    .pixel_clock_hz = DotClock,
+    .memory_clock_hz = MemoryClock,
+    .htotal = LineCharacters,
+    .vtotal = FieldLines,
+    .refresh_hz = Refresh,
+    .dpms = Dpms,
+    .program_mode = ProgramMode,
 };

@@ -123,12 +123,12 @@ const SimMachineConfig* SimConfig();
 // protection or side effects (a test's back door).
 uint8_t SimReadRegister(int card, SimRegisterFile file, uint16_t index);
 void SimWriteRegister(int card, SimRegisterFile file, uint16_t index, uint8_t value);
-double SimPixelClockHz(int card);   // the DCLK synthesizer's output
+double SimPixelClockHz(int card);   // the dot clock: the DCLK synthesizer's output (MISC selects it)
 double SimMemoryClockHz(int card);  // the MCLK synthesizer's output
-int SimHTotal(int card);            // in character clocks, 0 when unknown
-int SimVTotal(int card);            // in lines, 0 when unknown
-// The vertical refresh as the program's own reading of the hardware
-// defines it (for an interlaced mode, the frame rate); 0 when the model
+int SimHTotal(int card);            // a line in character clocks, 0 when unknown
+int SimVTotal(int card);            // a field in lines, 0 when unknown
+// The vertical refresh the card runs at, as the model computes it from its
+// registers (for an interlaced mode, the frame rate); 0 when the model
 // cannot tell.
 double SimRefreshHz(int card);
 enum SimDpms { SIM_DPMS_ON, SIM_DPMS_STANDBY, SIM_DPMS_SUSPEND, SIM_DPMS_OFF };
@@ -142,6 +142,11 @@ struct SimCardMode {
     bool interlaced;
 };
 SimCardMode SimGetCardMode(int card);
+// The display driver's mode set on a card, by the rules of this Windows (NT:
+// the frequency, 43 the interlaced timing; 9x: the registry's rate), without
+// resizing Wine's desktop or telling any window: for tests that walk many
+// modes. 0 when the card does not offer the mode (nothing changes).
+int SimSetCardMode(int card, int width, int height, int bits, int frequency);
 // The base address register of a card (offset 0x10 + 4 * bar) as the
 // machine assigned it at boot, flag bits cleared.
 uint32_t SimCardBarAddress(int card, int bar);

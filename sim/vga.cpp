@@ -4,6 +4,7 @@
 // data ports for their extended registers.
 #include <string.h>
 
+#include "fields.h"
 #include "machine_state.h"
 #include "modes.h"
 
@@ -21,8 +22,8 @@ const uint8_t reset_misc = 0xE3;
 
 enum {
     MISC_COLOUR_PORTS = 0x01,     // CRT controller at 0x3D4, else 0x3B4
-    MISC_CLOCK_SELECT = 0x0C,
     CR11_PROTECT = 0x80,          // write-protects CR00-CR07 (but CR07 bit 4)
+    CR11_VINT_DISABLE = 0x20,
     CR07_LINE_COMPARE_8 = 0x10,
     STATUS1_DISPLAY_DISABLED = 0x01,
     STATUS1_VERTICAL_RETRACE = 0x08,
@@ -78,12 +79,10 @@ void GenericWriteSr(int card, uint8_t index, uint8_t value) { Core(card)->sr[ind
 int NoWindow(int, int, uint32_t, uint8_t*) { return 0; }
 int NoWindowWrite(int, int, uint32_t, uint8_t) { return 0; }
 double UnknownClock(int) { return 0; }
-int GenericHTotal(int card) { return Core(card)->cr[0x00] + 5; }
-int GenericVTotal(int card)
-{
-    const uint8_t* cr = Core(card)->cr;
-    return cr[0x06] + ((cr[0x07] & 0x01) << 8) + ((cr[0x07] & 0x20) << 4) + 2;
-}
+// A line is the horizontal total register plus 5 character clocks, a frame
+// the vertical total register plus 2 lines.
+int GenericHTotal(int card) { return SimFieldRead(Core(card)->cr, &sim_vga_crtc.htotal) + 5; }
+int GenericVTotal(int card) { return SimFieldRead(Core(card)->cr, &sim_vga_crtc.vtotal) + 2; }
 double UnknownRefresh(int) { return 0; }
 SimDpms AlwaysOn(int) { return SIM_DPMS_ON; }
 void KeepRegisters(int card, const SimTiming*, int) {}
@@ -182,32 +181,44 @@ void VgaWrite(int card, uint16_t port, uint8_t value)
     }
 }
 
-void VgaWriteTiming(int card, const SimCrtcTiming* t)
+void VgaWriteTiming(int card, const SimCrtcTiming* t, const SimCrtcFields* fields)
 {
     uint8_t* cr = Core(card)->cr;
-    cr[0x11] &= ~CR11_PROTECT;
-    cr[0x00] = (uint8_t)t->htotal;
-    cr[0x01] = (uint8_t)t->hdisplay_end;
-    cr[0x02] = (uint8_t)t->hblank_start;
-    SetField(&cr[0x03], 0x1F, 0, t->hblank_end);
-    cr[0x03] |= 0x80;
-    cr[0x04] = (uint8_t)t->hsync_start;
-    cr[0x05] = (uint8_t)((t->hsync_end & 0x1F) | ((t->hblank_end & 0x20) << 2));
-    cr[0x06] = (uint8_t)t->vtotal;
-    cr[0x07] = (uint8_t)(((t->vtotal >> 8) & 1) | (((t->vdisplay_end >> 8) & 1) << 1) |
-                         (((t->vsync_start >> 8) & 1) << 2) | (((t->vblank_start >> 8) & 1) << 3) |
-                         CR07_LINE_COMPARE_8 | (((t->vtotal >> 9) & 1) << 5) |
-                         (((t->vdisplay_end >> 9) & 1) << 6) | (((t->vsync_start >> 9) & 1) << 7));
-    cr[0x09] = (uint8_t)((cr[0x09] & 0x9F) | 0x40 | (((t->vblank_start >> 9) & 1) << 5));
-    cr[0x10] = (uint8_t)t->vsync_start;
-    cr[0x12] = (uint8_t)t->vdisplay_end;
-    cr[0x15] = (uint8_t)t->vblank_start;
-    cr[0x16] = (uint8_t)t->vblank_end;
-    cr[0x18] = 0xFF;
-    cr[0x11] = (uint8_t)(CR11_PROTECT | 0x20 | (t->vsync_end & 0x0F));
+    SimFieldWrite(cr, &sim_cr11_protect, 0);
+    // No horizontal retrace delay; vertical retrace interrupts off.
+    cr[0x05] = 0;
+    cr[0x11] = CR11_VINT_DISABLE;
+    SimFieldWrite(cr, &fields->htotal, t->htotal);
+    SimFieldWrite(cr, &fields->hdisplay_end, t->hdisplay_end);
+    SimFieldWrite(cr, &fields->hblank_start, t->hblank_start);
+    SimFieldWrite(cr, &fields->hblank_end, t->hblank_end);
+    SimFieldWrite(cr, &fields->hsync_start, t->hsync_start);
+    SimFieldWrite(cr, &fields->hsync_end, t->hsync_end);
+    SimFieldWrite(cr, &fields->vtotal, t->vtotal);
+    SimFieldWrite(cr, &fields->vdisplay_end, t->vdisplay_end);
+    SimFieldWrite(cr, &fields->vblank_start, t->vblank_start);
+    SimFieldWrite(cr, &fields->vblank_end, t->vblank_end);
+    SimFieldWrite(cr, &fields->vsync_start, t->vsync_start);
+    SimFieldWrite(cr, &fields->vsync_end, t->vsync_end);
+    // The line compare at its maximum: no split screen.
+    SimFieldWrite(cr, &fields->line_compare, (1 << SimFieldWidth(&fields->line_compare)) - 1);
+    SimFieldWrite(cr, &sim_cr03_retrace_access, 1);
+    SimFieldWrite(cr, &sim_cr11_protect, 1);
 }
 
 const SimFamilyOps sim_vga_ops = {
-    VgaReset, GenericReadSr, GenericWriteSr, VgaGenericReadCr, VgaGenericWriteCr, NoWindow, NoWindowWrite,
-    UnknownClock, UnknownClock, GenericHTotal, GenericVTotal, UnknownRefresh, AlwaysOn, KeepRegisters,
+    .reset = VgaReset,
+    .read_sr = GenericReadSr,
+    .write_sr = GenericWriteSr,
+    .read_cr = VgaGenericReadCr,
+    .write_cr = VgaGenericWriteCr,
+    .window_read = NoWindow,
+    .window_write = NoWindowWrite,
+    .pixel_clock_hz = UnknownClock,
+    .memory_clock_hz = UnknownClock,
+    .htotal = GenericHTotal,
+    .vtotal = GenericVTotal,
+    .refresh_hz = UnknownRefresh,
+    .dpms = AlwaysOn,
+    .program_mode = KeepRegisters,
 };

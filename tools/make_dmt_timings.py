@@ -20,8 +20,9 @@ def main():
     for r in rows:
         if r["reduced_blanking"] != "0":
             continue
-        fields = [r[k] for k in ("width", "height", "refresh_hz", "pixel_clock_khz", "hsync_start", "hsync_end",
-                                 "htotal", "vsync_start", "vsync_end", "vtotal")]
+        fields = [r[k] for k in ("width", "height", "refresh_hz")]
+        fields.append(str(int(r["pixel_clock_khz"]) * 1000))
+        fields += [r[k] for k in ("hsync_start", "hsync_end", "htotal", "vsync_start", "vsync_end", "vtotal")]
         flags = []
         if r["interlaced"] == "1":
             flags.append("SIM_TIMING_INTERLACED")

@@ -1,6 +1,8 @@
 // The S3 model: the SR08 key, the synthesizers' output from hand-computed
-// register values, the CRT totals, the memory straps and DPMS.
+// register values, the CRT totals and refresh, the memory straps and DPMS.
 #include <math.h>
+
+#include <vector>
 
 #include "sim_test.h"
 
@@ -75,27 +77,76 @@ TEST(S3Synthesizers, MemoryClockResetsToSixtyMegahertz)
     EXPECT_NEAR(14318180.0 * 60 / (3 * 4), SimMemoryClockHz(0), 1.0);
 }
 
-TEST(S3Timing, TotalsAndRefreshFromTheCrtRegisters)
+TEST(S3Timing, TotalsFromTheCrtRegisters)
 {
-    BootS3(0x8A20);
-    WriteCr(0x11, 0x00);
-    WriteCr(0x00, 0x10);
-    WriteCr(0x5D, 0x01);   // + 256
-    WriteCr(0x5F, 0x01);   // + 512 on a Savage3D
-    WriteCr(0x43, 0x00);
-    EXPECT_EQ(0x10 + 256 + 512 + 5, SimHTotal(0));
-    WriteCr(0x43, 0x80);   // counts double, before the + 5
-    EXPECT_EQ(2 * (0x10 + 256 + 512) + 5, SimHTotal(0));
+    struct {
+        uint16_t device;
+        uint8_t cr43;
+        int htotal;
+    } cases[] = {
+        {0x8901, 0x00, 0x10 + 256 + 5},               // CR5D bit 0; CR5F is not part of it
+        {0x8A20, 0x00, 0x10 + 256 + 512 + 5},         // CR5F bits 1..0 on a Savage3D
+        {0x8A20, 0x80, 2 * (0x10 + 256 + 512) + 5},   // counts double, before the + 5
+    };
+    for (auto& c : cases) {
+        BootS3(c.device);
+        WriteCr(0x11, 0x00);
+        WriteCr(0x00, 0x10);
+        WriteCr(0x5D, 0x01);
+        WriteCr(0x5F, 0x01);
+        WriteCr(0x43, c.cr43);
+        EXPECT_EQ(c.htotal, SimHTotal(0)) << std::hex << c.device << " CR43=" << (int)c.cr43;
+    }
     WriteCr(0x06, 0x20);
     WriteCr(0x07, 0x21);   // bits 8 and 9
     WriteCr(0x5E, 0x01);   // bit 10
     EXPECT_EQ(0x20 + 256 + 512 + 1024 + 2, SimVTotal(0));
+}
 
-    BootS3(0x8901);  // 1024x768, 16 bits, 75 Hz
-    double progressive = SimRefreshHz(0);
-    EXPECT_NEAR(75.03, progressive, 0.3);
-    WriteCr(0x42, ReadCr(0x42) | 0x20);
-    EXPECT_NEAR(progressive / 2, SimRefreshHz(0), 0.01) << "interlaced: two fields per frame";
+// The VGA's own modes as the BIOS sets them run at their known rates: mode
+// 12h (25.175 MHz, 100 characters of 8 dots a line, 525 lines) at 59.94 Hz,
+// text mode 03h (28.322 MHz, 100 of 9 dots, 449 lines) at 70.09 Hz. The S3
+// bits change mode 12h as the chip's description has them.
+TEST(S3Timing, RefreshFromTheRegisters)
+{
+    struct Reg {
+        SimRegisterFile file;
+        uint8_t index, value;
+    };
+    const Reg mode_12h[] = {{SIM_REG_MISC, 0, 0xE3},       {SIM_REG_SEQUENCER, 0x01, 0x01},
+                            {SIM_REG_CRTC, 0x00, 0x5F},    {SIM_REG_CRTC, 0x06, 0x0B},
+                            {SIM_REG_CRTC, 0x07, 0x3E},    {SIM_REG_CRTC, 0x5D, 0x00},
+                            {SIM_REG_CRTC, 0x5E, 0x00},    {SIM_REG_CRTC, 0x42, 0x00},
+                            {SIM_REG_CRTC, 0x43, 0x00},    {SIM_REG_CRTC, 0x67, 0x00},
+                            {SIM_REG_SEQUENCER, 0x18, 0x00}};
+    const double hz_12h = 25175000.0 / (800 * 525);
+    struct {
+        const char* what;
+        std::vector<Reg> changes;
+        double hz;
+    } cases[] = {
+        {"mode 12h", {}, hz_12h},
+        {"text mode 03h",
+         {{SIM_REG_MISC, 0, 0x67}, {SIM_REG_SEQUENCER, 0x01, 0x00}, {SIM_REG_CRTC, 0x06, 0xBF},
+          {SIM_REG_CRTC, 0x07, 0x1F}},
+         28322000.0 / (900 * 449)},
+        {"interlaced: a frame of two fields", {{SIM_REG_CRTC, 0x42, 0x20}}, hz_12h / 2},
+        {"SR18 is not consulted at 8 bits", {{SIM_REG_SEQUENCER, 0x18, 0x80}}, hz_12h},
+        {"16 bits: 4 pixels a character", {{SIM_REG_CRTC, 0x67, 0x50}}, 2 * hz_12h},
+        {"16 bits, SR18: two clocks a pixel", {{SIM_REG_CRTC, 0x67, 0x50}, {SIM_REG_SEQUENCER, 0x18, 0x80}}, hz_12h},
+        {"CR43: 2 x 0x5F + 5 characters",
+         {{SIM_REG_CRTC, 0x67, 0x50}, {SIM_REG_SEQUENCER, 0x18, 0x80}, {SIM_REG_CRTC, 0x43, 0x80}},
+         hz_12h * 100 / 195},
+        {"the synthesizer, M = 95, N = 12, R = 1",
+         {{SIM_REG_MISC, 0, 0xEF}, {SIM_REG_SEQUENCER, 0x12, 0x2C}, {SIM_REG_SEQUENCER, 0x13, 0x5F}},
+         14318180.0 * 97 / (14 * 2) / (800 * 525)},
+    };
+    BootS3(0x8901);
+    for (auto& c : cases) {
+        for (const Reg& r : mode_12h) SimWriteRegister(0, r.file, r.index, r.value);
+        for (const Reg& r : c.changes) SimWriteRegister(0, r.file, r.index, r.value);
+        EXPECT_NEAR(c.hz, SimRefreshHz(0), 0.001) << c.what;
+    }
 }
 
 TEST(S3Straps, MemorySizeReadsBackThroughTheProgramsTable)

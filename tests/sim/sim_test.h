@@ -81,40 +81,4 @@ inline bool RegKeyExists(HKEY root, const char* path)
     return true;
 }
 
-// The refresh rate as the program reads it from an S3 chip: pixel clock
-// from SR12/SR13 (SR29 on a Savage3D), halved by SR18 bit 7 above 8 bits,
-// over character width, horizontal and vertical totals.
-struct S3Reading {
-    double pixel_hz;
-    int htotal, vtotal, char_width;
-    double refresh() const { return pixel_hz / ((double)char_width * htotal * vtotal); }
-};
-inline S3Reading ReadS3Refresh(bool savage, bool two_bit_r, int bits)
-{
-    WriteSr(0x08, 0x06);
-    int m, n, r;
-    uint8_t sr12 = ReadSr(0x12), sr13 = ReadSr(0x13);
-    if (savage) {
-        uint8_t sr29 = ReadSr(0x29);
-        m = sr13 + 256 * ((sr29 >> 3) & 1);
-        n = (sr12 & 0x3F) + 64 * ((sr29 >> 4) & 1);
-        r = (sr12 >> 6) + 4 * ((sr29 >> 2) & 1);
-    } else {
-        m = sr13 & 0x7F;
-        n = sr12 & 0x1F;
-        r = two_bit_r ? (sr12 >> 5) & 3 : (sr12 >> 5) & 7;
-    }
-    S3Reading reading;
-    reading.pixel_hz = 14318180.0 * (m + 2) / ((n + 2) * (double)(1 << r));
-    if (bits != 8 && (ReadSr(0x18) & 0x80)) reading.pixel_hz /= 2;
-    int t = ReadCr(0x00) + 256 * (ReadCr(0x5D) & 1);
-    if (savage) t += 512 * (ReadCr(0x5F) & 3);
-    if (ReadCr(0x43) & 0x80) t *= 2;
-    reading.htotal = t + 5;
-    uint8_t cr07 = ReadCr(0x07);
-    reading.vtotal = ReadCr(0x06) + 256 * (cr07 & 1) + 512 * ((cr07 >> 5) & 1) + 1024 * (ReadCr(0x5E) & 1) + 2;
-    reading.char_width = bits == 15 || bits == 16 ? 4 : 8;
-    return reading;
-}
-
 #endif
