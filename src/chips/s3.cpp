@@ -2,6 +2,7 @@
 // DX/GX, GX2 and Savage3D, all through the VGA sequencer and CRT controller
 // and the S3 extensions behind them.
 #include "base/adapters.h"
+#include "base/module_reset.h"
 #include "base/state.h"
 #include "chips/chip_io.h"
 #include "chips/chips.h"
@@ -161,6 +162,9 @@ static const S3DpmsState s3_dpms_states[] = {
 
 // Pixel clock limits loaded by CMD_INIT_CHIP, shared by every S3 adapter.
 static const SynthLimits* s3_dclk_limits = &older_dclk;
+
+static void ResetS3() { s3_dclk_limits = &older_dclk; }
+VISTREL_MODULE_RESET(ResetS3);
 
 static const S3Chip* CurrentChip()
 {

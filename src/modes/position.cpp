@@ -5,12 +5,20 @@
 #include <windows.h>
 
 #include "base/adapters.h"
+#include "base/module_reset.h"
 #include "base/settings.h"
 #include "chips/chip_io.h"
 #include "chips/chips.h"
 #include "chips/reg_field.h"
 
 int adjust_offset_h, adjust_offset_v;
+
+static void ResetPositionState()
+{
+    adjust_offset_h = 0;
+    adjust_offset_v = 0;
+}
+VISTREL_MODULE_RESET(ResetPositionState);
 
 enum : uint8_t {
     CR02_HBLANK_START = 0x02,
