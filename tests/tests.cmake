@@ -65,3 +65,8 @@ set_tests_properties(bench-modetable PROPERTIES PASS_REGULAR_EXPRESSION "platfor
 vistrel_test(adjust)
 target_sources(test-adjust PRIVATE ${VISTREL_ROOT}/resources/vistrel.rc)
 vistrel_add_test(adjust adjust)
+
+# The property pages and what they show.
+vistrel_test(pages)
+target_compile_definitions(test-pages PRIVATE VISTREL_TEST_DATA="${VISTREL_ROOT}/tests/data")
+vistrel_add_test(pages pages)
