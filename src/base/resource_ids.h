@@ -5,6 +5,12 @@
 #ifndef VISTREL_RESOURCE_IDS_H
 #define VISTREL_RESOURCE_IDS_H
 
+/* The system headers name one of their own icons IDI_INFORMATION; they
+   come first, so that the page's icon number below is the one that stays
+   wherever this header is included. */
+#include <windows.h>
+#undef IDI_INFORMATION
+
 /* Icons, 32 x 32 and 16 x 16. */
 #define IDI_TRAY 103
 #define IDI_SHEET 147
