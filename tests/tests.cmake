@@ -65,3 +65,6 @@ set_tests_properties(bench-modetable PROPERTIES PASS_REGULAR_EXPRESSION "platfor
 vistrel_test(adjust)
 target_sources(test-adjust PRIVATE ${VISTREL_ROOT}/resources/vistrel.rc)
 vistrel_add_test(adjust adjust)
+
+# loupe.exe's command line and screen part, linked into the companions' tests.
+target_sources(test-companions PRIVATE ${VISTREL_ROOT}/companions/loupe_command.cpp)
