@@ -21,8 +21,8 @@ void ParseLoupeCommand(const char* arguments, LoupeCommand* command)
     while (IsBlank(*p)) ++p;
     const char* rest;
     if (*p == '"') {
-        const char* close = FindChar(p + 1, '"');
-        if (!close) close = p + 1 + TextLength(p + 1);
+        const char* close = p + 1;
+        while (*close && *close != '"') ++close;
         CopyPart(command->title, sizeof command->title, p + 1, close);
         rest = *close ? close + 1 : close;
     } else {

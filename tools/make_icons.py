@@ -165,7 +165,7 @@ def information(c):
 def performance(c):
     """A speed gauge: coloured scale, needle towards the top right."""
     cx, cy = 16, 19
-    face = union(minus(circle(cx, cy, 14.5), rect(0, cy + 7, 32, 32)))
+    face = minus(circle(cx, cy, 14.5), rect(0, cy + 7, 32, 32))
     c.raised(face, WHITE, light=WHITE, dark=SILVER)
 
     def band(start, end):
@@ -226,7 +226,7 @@ def colour(c):
         c.fill(circle(x, y, 3), paint, BLACK if c.width == 32 else None)
 
 
-def letter_a(c, left, bottom, height, width):
+def letter_a(left, bottom, height, width):
     apex = (left + width / 2, bottom - height)
     legs = stroke([(left + width * 0.1, bottom - 1), apex, (left + width * 0.9, bottom - 1)], width / 4)
     bar = stroke([(left + width * 0.3, bottom - height * 0.35), (left + width * 0.7, bottom - height * 0.35)],
@@ -236,8 +236,8 @@ def letter_a(c, left, bottom, height, width):
 
 def font_size(c):
     """A large and a small A."""
-    c.fill(letter_a(c, 1, 30, 26, 20), NAVY)
-    c.fill(letter_a(c, 19, 30, 14, 12), BLACK)
+    c.fill(letter_a(1, 30, 26, 20), NAVY)
+    c.fill(letter_a(19, 30, 14, 12), BLACK)
 
 
 def refresh(c):

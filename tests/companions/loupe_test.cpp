@@ -19,7 +19,7 @@ const struct {
     {"\"Zoom In\" C:\\Program Files\\Vistrel 2\\ZNTR2.INI 2", "Zoom In", "C:\\Program Files\\Vistrel 2\\ZNTR2.INI", true},
     {"  \"\" C:\\V\\ZNTR2.INI\t2  ", "", "C:\\V\\ZNTR2.INI", true},
     {"\"Zoom\" C:\\V\\ZNTR2", "Zoom", "C:\\V\\ZNTR2", false},
-    {"\"Zoom\" 2", "Zoom", "", true},
+    {"\"Zoom\"2", "Zoom", "", true},
     {"\"Zoom In", "Zoom In", "", false},
     {"Zoom C:\\V\\A.INI", "Zoom", "C:\\V\\A.INI", false},
     {"", "", "", false},
