@@ -21,3 +21,12 @@ target_compile_options(gatectl PRIVATE ${VISTREL_PROGRAM_FLAGS} ${VISTREL_CODE_F
 target_link_options(gatectl PRIVATE ${VISTREL_COMPANION_LINK_FLAGS} ${VISTREL_EXE_ENTRY})
 target_link_libraries(gatectl PRIVATE vistrel_runtime user32 advapi32 ${VISTREL_RUNTIME_LIBS})
 target_include_directories(gatectl PRIVATE ${VISTREL_ROOT}/companions ${VISTREL_ROOT}/src)
+
+# loupe.exe, the zoom tool the menu starts; its icon is the menu's magnifier.
+add_executable(loupe WIN32 ${VISTREL_ROOT}/companions/loupe.cpp ${VISTREL_ROOT}/companions/loupe_command.cpp
+               ${VISTREL_ROOT}/companions/loupe.rc)
+set_source_files_properties(${VISTREL_ROOT}/companions/loupe.rc PROPERTIES OBJECT_DEPENDS ${VISTREL_ROOT}/resources/zoom.ico)
+target_compile_options(loupe PRIVATE $<$<COMPILE_LANGUAGE:CXX>:${VISTREL_PROGRAM_FLAGS} ${VISTREL_CODE_FLAGS}>)
+target_link_options(loupe PRIVATE ${VISTREL_COMPANION_LINK_FLAGS} ${VISTREL_EXE_ENTRY})
+target_link_libraries(loupe PRIVATE vistrel_runtime user32 gdi32 ${VISTREL_RUNTIME_LIBS})
+target_include_directories(loupe PRIVATE ${VISTREL_ROOT}/companions ${VISTREL_ROOT}/src ${VISTREL_ROOT}/resources)

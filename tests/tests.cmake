@@ -70,3 +70,6 @@ vistrel_add_test(adjust adjust)
 vistrel_test(pages)
 target_compile_definitions(test-pages PRIVATE VISTREL_TEST_DATA="${VISTREL_ROOT}/tests/data")
 vistrel_add_test(pages pages)
+
+# loupe.exe's command line and screen part, linked into the companions' tests.
+target_sources(test-companions PRIVATE ${VISTREL_ROOT}/companions/loupe_command.cpp)

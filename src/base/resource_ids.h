@@ -19,10 +19,10 @@
 #define IDI_CLOSE 209
 #define IDI_ZOOM 210
 #define IDI_POWER 211
-#define IDI_DESKTOP 220
-#define IDI_INFORMATION 221
-#define IDI_MONITOR 222
-#define IDI_PERFORMANCE 223
+#define IDI_DESKTOP_PAGE 220
+#define IDI_INFORMATION_PAGE 221
+#define IDI_MONITOR_PAGE 222
+#define IDI_PERFORMANCE_PAGE 223
 
 /* The picture the Monitor page shows on Windows NT (also the panning
    dialog's corner picture). */
