@@ -3,6 +3,7 @@
 #include <windows.h>
 
 #include "base/adapters.h"
+#include "base/module_reset.h"
 #include "base/state.h"
 #include "chips/s3.h"
 #include "chips/unsupported.h"
@@ -35,7 +36,12 @@ const ChipRow chip_table[CHIP_TABLE_ROWS] = {
     {.vendor_id = 0x100c, .device_id = 0x3208, UNSUPPORTED_FAMILY},  // ET6000
 };
 
-static const ChipRow* CurrentRow() { return &chip_table[CurrentAdapter()->chip_row]; }
+const ChipRow* chip_rows = chip_table;
+
+static void ResetChipRows() { chip_rows = chip_table; }
+VISTREL_MODULE_RESET(ResetChipRows);
+
+static const ChipRow* CurrentRow() { return &chip_rows[CurrentAdapter()->chip_row]; }
 
 static uint32_t Command(uint32_t command, uintptr_t argument = 0) { return CurrentRow()->Dispatch(command, argument); }
 

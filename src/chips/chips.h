@@ -69,6 +69,9 @@ struct ChipRow {
 
 enum { CHIP_TABLE_ROWS = 20 };
 extern const ChipRow chip_table[CHIP_TABLE_ROWS];
+// The rows the wrappers dispatch through, by the adapter's chip_row: the
+// chip table, or a table a test puts here to stand in for a family.
+extern const ChipRow* chip_rows;
 
 uint32_t chip_init();
 uint32_t chip_open_io();
