@@ -66,9 +66,12 @@ vistrel_test(adjust)
 target_sources(test-adjust PRIVATE ${VISTREL_ROOT}/resources/vistrel.rc)
 vistrel_add_test(adjust adjust)
 
-# The property pages and what they show.
+# The property pages and what they show; the pages' templates, icons and
+# animation are resources of the program.
 vistrel_test(pages)
-target_compile_definitions(test-pages PRIVATE VISTREL_TEST_DATA="${VISTREL_ROOT}/tests/data")
+target_sources(test-pages PRIVATE ${VISTREL_ROOT}/resources/vistrel.rc)
+target_compile_definitions(test-pages PRIVATE VISTREL_TEST_DATA="${VISTREL_ROOT}/tests/data"
+                           VISTREL_RESOURCES="${VISTREL_ROOT}/resources")
 vistrel_add_test(pages pages)
 
 # loupe.exe's command line and screen part, linked into the companions' tests.

@@ -7,6 +7,7 @@
 #include "hookkeep.h"
 
 BOOL(WINAPI* restart_windows)(UINT flags, DWORD reason) = ExitWindowsEx;
+DWORD(WINAPI* keep_hook)(HWND window, DWORD state, DWORD enable, DWORD minutes) = SetKeepHook;
 DWORD gate_reply_timeout = GATE_REPLY_TIMEOUT_MS;
 DWORD power_minute_length = KEEP_REAL_MINUTE;
 
@@ -51,6 +52,7 @@ void ForgetGateMemorySize() { gate_memory_size = 0; }
 static void ResetCompanions()
 {
     restart_windows = ExitWindowsEx;
+    keep_hook = SetKeepHook;
     gate_reply_timeout = GATE_REPLY_TIMEOUT_MS;
     power_minute_length = KEEP_REAL_MINUTE;
     gate_memory_size = 0;
@@ -60,7 +62,7 @@ VISTREL_MODULE_RESET(ResetCompanions);
 int StartPowerTimers(HWND main_window, int on)
 {
     if (!on) {
-        SetKeepHook(NULL, KEEP_STATE_ALL, 0, 0);
+        keep_hook(NULL, KEEP_STATE_ALL, 0, 0);
         return 1;
     }
     static const struct {
@@ -71,10 +73,10 @@ int StartPowerTimers(HWND main_window, int on)
         {SETTING_SUSPEND, KEEP_STATE_SUSPEND},
         {SETTING_SHUTOFF, KEEP_STATE_OFF},
     };
-    SetKeepHook(main_window, KEEP_STATE_STANDBY, 1, power_minute_length);
+    keep_hook(main_window, KEEP_STATE_STANDBY, 1, power_minute_length);
     for (const auto& timer : timers) {
         int32_t minutes = LoadSetting(timer.setting);
-        if (minutes > 0) SetKeepHook(main_window, timer.state, 1, (DWORD)minutes);
+        if (minutes > 0) keep_hook(main_window, timer.state, 1, (DWORD)minutes);
     }
     return 1;
 }

@@ -24,6 +24,9 @@ int StartPowerTimers(HWND main_window, int on);
 
 // The direct restart; tests put a recorder here.
 extern BOOL(WINAPI* restart_windows)(UINT flags, DWORD reason);
+// The hook library's SetKeepHook, through which every call of the program
+// goes; tests put a recorder here.
+extern DWORD(WINAPI* keep_hook)(HWND window, DWORD state, DWORD enable, DWORD minutes);
 // The companion's answer wait; tests shorten it.
 extern DWORD gate_reply_timeout;
 // The timer minute StartPowerTimers gives the hook library, in 1/65536 of a

@@ -11,4 +11,29 @@
 // base/texts.h); returns when the user closes it.
 void OpenPropertySheet(HINSTANCE inst, HWND owner, int requested_page);
 
+// The position of the requested page among the included ones (bit n of
+// included set for page n): its own, or that of the included page before
+// it, or 0.
+int StartPosition(unsigned included, int requested_page);
+
+enum AnimationOperation {
+    ANIMATION_PLAY = 100,
+    ANIMATION_STOP = 101,
+    ANIMATION_CLOSE = 102,
+};
+
+// An animation control in rect of the page: the file the chip file's
+// "AVIFile" names beside the executable when it plays, otherwise the
+// resource. NULL when neither opens.
+HWND CreatePageAnimation(HWND page, int control_id, int resource_id, const RECT* rect);
+// source: a file path, or a resource id of the instance (MAKEINTRESOURCEA).
+HWND CreateAnimationControl(HWND parent, int control_id, LPCSTR source, const RECT* rect);
+void ControlAnimation(HWND control, AnimationOperation operation);
+
+// A page's share of the animation: call it first with every message of the
+// page's procedure. It creates the animation in the page's frame control on
+// WM_INITDIALOG, plays it while the page is shown and closes it with the
+// page; control is the page's own variable for it.
+void AnimatePage(HWND page, UINT message, LPARAM lparam, int frame_id, HWND* control);
+
 #endif
