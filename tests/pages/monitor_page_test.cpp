@@ -7,14 +7,17 @@
 #include <commctrl.h>
 #include <prsht.h>
 
+#include "adjust/adjust_window.h"
 #include "base/adapters.h"
 #include "base/module_reset.h"
+#include "base/protocol.h"
 #include "base/resource_ids.h"
 #include "base/settings.h"
 #include "base/state.h"
 #include "base/texts.h"
 #include "hardware/companions.h"
 #include "modes/detect.h"
+#include "modes/position.h"
 #include "pages/monitor_info.h"
 #include "pages/sheet_driver.h"
 #include "support/machine.h"
@@ -75,14 +78,14 @@ void Click(HWND sheet, int id) { SendMessageA(GetDlgItem(CurrentPage(sheet), id)
 
 TEST_F(MonitorPageTest, TimersAreStoredAndHandedToTheHookLibraryOnApply)
 {
-    SaveSetting(SETTING_SUSPEND, 5);
+    SaveSetting(SETTING_SUSPEND, 100);
     SaveSetting(SETTING_SHUTOFF, -1);
     const std::vector<KeepCall> none;
     RunSheet(PAGE_MONITOR, {
         [](HWND sheet) {
             HWND page = CurrentPage(sheet);
             ExpectTimer(page, standby, false, "1");
-            ExpectTimer(page, suspend, true, "5");
+            ExpectTimer(page, suspend, true, "100");
             ExpectTimer(page, shutoff, false, "1");
             Click(sheet, IDC_MONITOR_STANDBY_CHECK);
             ExpectTimer(page, standby, true, "1");
@@ -100,10 +103,12 @@ TEST_F(MonitorPageTest, TimersAreStoredAndHandedToTheHookLibraryOnApply)
             EXPECT_EQ(none, keep_calls) << "nothing changed";
             // The arrow key of the up-down alone changes the number, not the page.
             SendMessageA(GetDlgItem(CurrentPage(sheet), IDC_MONITOR_STANDBY_EDIT), WM_KEYDOWN, VK_UP, 0);
+            SendMessageA(GetDlgItem(CurrentPage(sheet), IDC_MONITOR_SUSPEND_EDIT), WM_KEYDOWN, VK_UP, 0);
             EXPECT_EQ("2", ControlText(CurrentPage(sheet), IDC_MONITOR_STANDBY_EDIT));
+            EXPECT_EQ("100", ControlText(CurrentPage(sheet), IDC_MONITOR_SUSPEND_EDIT)) << "the longest timer";
             EXPECT_FALSE(ApplyEnabled(sheet));
             Click(sheet, IDC_MONITOR_SUSPEND_CHECK);
-            ExpectTimer(CurrentPage(sheet), suspend, false, "5");
+            ExpectTimer(CurrentPage(sheet), suspend, false, "100");
             PressSheetButton(sheet, PSBTN_APPLYNOW);
         },
         [&](HWND sheet) {
@@ -116,9 +121,16 @@ TEST_F(MonitorPageTest, TimersAreStoredAndHandedToTheHookLibraryOnApply)
 }
 
 // Windows NT keeps nothing about the monitor: a picture stands in for the
-// list. Without picture moving both of its buttons are off.
+// list. Without picture moving both of its buttons are off; with it Adjust
+// opens the adjustment window over the sheet and Default forgets the mode's
+// position.
 TEST_F(MonitorPageTest, SystemAndAdapterDecideWhatThePageOffers)
 {
+    WNDCLASSA wc = {};
+    wc.lpfnWndProc = AdjustWindowProc;
+    wc.hInstance = instance;
+    wc.lpszClassName = adjust_window_class;
+    RegisterClassA(&wc);
     static const struct {
         int windows;
         uint32_t flags;
@@ -131,14 +143,24 @@ TEST_F(MonitorPageTest, SystemAndAdapterDecideWhatThePageOffers)
         BootMachine(Machine(c.windows, {Card(0x5333, 0x8901)}));
         DetectAdapters();
         CurrentAdapter()->flags |= c.flags;
+        SaveSetting(SETTING_POSITION_H, 0x90);
+        adjust_offset_h = 3;
         RunSheet(PAGE_MONITOR, {[&](HWND sheet) {
             HWND page = CurrentPage(sheet);
+            EXPECT_EQ(0, adjust_offset_h) << "offsets of an earlier visit are not undone again";
             EXPECT_EQ(c.list, (bool)IsWindowVisible(GetDlgItem(page, IDC_MONITOR_LIST))) << c.windows;
             EXPECT_EQ(c.list, (bool)IsWindowVisible(GetDlgItem(page, IDC_MONITOR_INFO_GROUP))) << c.windows;
             EXPECT_EQ(!c.list, (bool)IsWindowVisible(GetDlgItem(page, IDC_MONITOR_NT_PICTURE))) << c.windows;
             if (c.list) EXPECT_EQ("        DELL D1028L", ListLines(GetDlgItem(page, IDC_MONITOR_LIST)).at(1));
             EXPECT_EQ(c.adjust, (bool)IsWindowEnabled(GetDlgItem(page, IDC_MONITOR_ADJUST))) << c.windows;
             EXPECT_EQ(c.adjust, (bool)IsWindowEnabled(GetDlgItem(page, IDC_MONITOR_DEFAULT))) << c.windows;
+            if (!c.adjust) return;
+            Click(sheet, IDC_MONITOR_ADJUST);
+            HWND adjust = FindWindowA(adjust_window_class, NULL);
+            EXPECT_TRUE(adjust && GetWindow(adjust, GW_OWNER) == sheet);
+            DestroyWindow(adjust);
+            Click(sheet, IDC_MONITOR_DEFAULT);
+            EXPECT_EQ(-1, LoadSetting(SETTING_POSITION_H));
         }});
     }
 }
