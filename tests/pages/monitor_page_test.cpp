@@ -25,22 +25,17 @@
 
 namespace {
 
-struct KeepCall {
+struct HookCall {
     HWND window;
     DWORD state, enable, minutes;
-    bool operator==(const KeepCall&) const = default;
+    bool operator==(const HookCall&) const = default;
 };
-std::vector<KeepCall> keep_calls;
+std::vector<HookCall> keep_calls;
 
 DWORD WINAPI RecordKeepCall(HWND window, DWORD state, DWORD enable, DWORD minutes)
 {
     keep_calls.push_back({window, state, enable, minutes});
     return 1;
-}
-
-std::ostream& operator<<(std::ostream& out, const KeepCall& c)
-{
-    return out << "(" << c.window << ", " << c.state << ", " << c.enable << ", " << c.minutes << ")";
 }
 
 class MonitorPageTest : public ::testing::Test {
@@ -80,7 +75,7 @@ TEST_F(MonitorPageTest, TimersAreStoredAndHandedToTheHookLibraryOnApply)
 {
     SaveSetting(SETTING_SUSPEND, 100);
     SaveSetting(SETTING_SHUTOFF, -1);
-    const std::vector<KeepCall> none;
+    const std::vector<HookCall> none;
     RunSheet(PAGE_MONITOR, {
         [](HWND sheet) {
             HWND page = CurrentPage(sheet);
@@ -94,7 +89,7 @@ TEST_F(MonitorPageTest, TimersAreStoredAndHandedToTheHookLibraryOnApply)
         },
         [&](HWND sheet) {
             EXPECT_EQ(1, LoadSetting(SETTING_STANDBY));
-            EXPECT_EQ(std::vector<KeepCall>({{NULL, 1, 1, 1}}), keep_calls);
+            EXPECT_EQ(std::vector<HookCall>({{NULL, 1, 1, 1}}), keep_calls);
             EXPECT_FALSE(ApplyEnabled(sheet));
             keep_calls.clear();
             PressSheetButton(sheet, PSBTN_APPLYNOW);
@@ -115,7 +110,7 @@ TEST_F(MonitorPageTest, TimersAreStoredAndHandedToTheHookLibraryOnApply)
             EXPECT_EQ(2, LoadSetting(SETTING_STANDBY));
             EXPECT_EQ(-1, LoadSetting(SETTING_SUSPEND));
             EXPECT_EQ(-1, LoadSetting(SETTING_SHUTOFF));
-            EXPECT_EQ(std::vector<KeepCall>({{NULL, 1, 1, 2}, {NULL, 2, 0, 0}}), keep_calls);
+            EXPECT_EQ(std::vector<HookCall>({{NULL, 1, 1, 2}, {NULL, 2, 0, 0}}), keep_calls);
         },
     });
 }
@@ -204,22 +199,6 @@ void DropMode1()
                        "System\\CurrentControlSet\\Services\\Class\\" + std::string(driver.c_str()) + "\\MODES");
 }
 
-// The Config Manager lists no monitor.
-void DropMonitorNode()
-{
-    const std::string nodes = "Config Manager\\Enum";
-    HKEY key;
-    ASSERT_EQ(ERROR_SUCCESS, RegOpenKeyExA(HKEY_DYN_DATA, nodes.c_str(), 0, KEY_READ, &key));
-    std::vector<std::string> monitors;
-    char name[64];
-    for (DWORD i = 0; RegEnumKeyA(key, i, name, sizeof name) == ERROR_SUCCESS; ++i)
-        if (ReadRegistryRaw(HKEY_DYN_DATA, nodes + "\\" + name, "HardWareKey").find("MONITOR") != std::string::npos)
-            monitors.push_back(name);
-    RegCloseKey(key);
-    ASSERT_EQ(1u, monitors.size());
-    DeleteRegistryTree(HKEY_DYN_DATA, nodes + "\\" + monitors[0]);
-}
-
 std::vector<std::string> Join(std::initializer_list<std::vector<std::string>> parts)
 {
     std::vector<std::string> all;
@@ -230,24 +209,28 @@ std::vector<std::string> Join(std::initializer_list<std::vector<std::string>> pa
 TEST_F(MonitorPageTest, MonitorListFromTheRegistry)
 {
     const std::vector<std::string> max_only(driver_lines.begin(), driver_lines.begin() + 2);
+    const SimCardConfig trio = Card(0x5333, 0x8901);
+    SimCardConfig without_monitor = trio;
+    without_monitor.display_device = false;
     const struct {
         int windows;
+        SimCardConfig card;
         void (*change)();
         std::vector<std::string> lines;
         int result;
         const char* name;
     } cases[] = {
-        {SIM_WINDOWS_98, NULL, Join({monitor_lines, edid_lines, driver_lines}), 1, "DELL D1028L"},
+        {SIM_WINDOWS_98, trio, NULL, Join({monitor_lines, edid_lines, driver_lines}), 1, "DELL D1028L"},
         // Windows 95 names its monitor after no adapter.
-        {SIM_WINDOWS_95, NULL, Join({monitor_lines, edid_lines, driver_lines}), 1, "DELL D1028L"},
-        {SIM_WINDOWS_98, CutEdid, Join({monitor_lines, driver_lines}), 1, "DELL D1028L"},
-        {SIM_WINDOWS_98, DropMode1, Join({monitor_lines, edid_lines, max_only}), 0, "DELL D1028L"},
-        {SIM_WINDOWS_98, DropMonitorNode, {"Monitor Type", "        Unknown", "Manufacturer", "        Unknown"}, 0,
-         "Unknown"},
+        {SIM_WINDOWS_95, trio, NULL, Join({monitor_lines, edid_lines, driver_lines}), 1, "DELL D1028L"},
+        {SIM_WINDOWS_98, trio, CutEdid, Join({monitor_lines, driver_lines}), 1, "DELL D1028L"},
+        {SIM_WINDOWS_98, trio, DropMode1, Join({monitor_lines, edid_lines, max_only}), 0, "DELL D1028L"},
+        {SIM_WINDOWS_98, without_monitor, NULL,
+         {"Monitor Type", "        Unknown", "Manufacturer", "        Unknown"}, 0, "Unknown"},
     };
     HWND list = CreateWindowA("LISTBOX", "", WS_POPUP, 0, 0, 200, 200, NULL, NULL, NULL, NULL);
     for (const auto& c : cases) {
-        BootMachine(Machine(c.windows, {Card(0x5333, 0x8901)}));
+        BootMachine(Machine(c.windows, {c.card}));
         DetectAdapters();
         if (c.change) ASSERT_NO_FATAL_FAILURE(c.change());
         SendMessageA(list, LB_RESETCONTENT, 0, 0);
@@ -296,7 +279,6 @@ TEST(MonitorInfo, KeysOfOtherAdaptersAndSystems)
         {ours, true, true, MONITOR_KEY_FOUND},
         {ours, false, true, MONITOR_KEY_PASS},
         {ours, false, false, MONITOR_KEY_CANDIDATE},
-        {"PCI\\VEN_5333&DEV_8901&SUBSYS_00000000&REV_16\\BUS_00&DEV_0A&FUNC_00", true, false, MONITOR_KEY_PASS},
         {"MONITOR\\DEL730B\\PCI_VEN_10DE&DEV_0020&SUBSYS_00000000&REV_04_BUS_01&DEV_00&FUNC_00", true, true,
          MONITOR_KEY_PASS},
         {"ROOT\\MONITOR\\0000", true, true, MONITOR_KEY_CANDIDATE},
@@ -317,7 +299,6 @@ TEST(MonitorInfo, SyncRangesOfMode1)
         {"30.0-70.0,50.0-120.0,+,+", "30.0-70.0 kHz", "50.0-120.0 Hz"},
         {"31.5,60", "31.5 kHz", "60 Hz"},
         {"31.5", "31.5 kHz", " Hz"},
-        {",,", " kHz", " Hz"},
     };
     for (const auto& c : cases) {
         char horizontal[32], vertical[32];

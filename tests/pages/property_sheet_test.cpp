@@ -91,23 +91,10 @@ LRESULT CALLBACK RecordOpen(int code, WPARAM wparam, LPARAM lparam)
     return CallNextHookEx(open_hook, code, wparam, lparam);
 }
 
-std::string ReadFileBytes(const std::string& path)
-{
-    std::string bytes;
-    HANDLE f = CreateFileA(path.c_str(), GENERIC_READ, FILE_SHARE_READ, NULL, OPEN_EXISTING, 0, NULL);
-    if (f == INVALID_HANDLE_VALUE) return bytes;
-    char buffer[4096];
-    DWORD got;
-    while (ReadFile(f, buffer, sizeof buffer, &got, NULL) && got) bytes.append(buffer, got);
-    CloseHandle(f);
-    return bytes;
-}
-
 TEST(PageAnimation, ChipFileNamesAFileBesideTheProgram)
 {
     const std::string folder = ProgramFolder();
-    const std::string clip = ReadFileBytes(WindowsPathOf(VISTREL_RESOURCES "/pages.avi"));
-    ASSERT_GT(clip.size(), 1000u);
+    const std::string clip = WindowsPathOf(VISTREL_RESOURCES "/pages.avi");
     static const struct {
         const char* entry;  // the chip file's AVIFile line
         const char* file;   // what lies beside the program under that name
@@ -125,7 +112,8 @@ TEST(PageAnimation, ChipFileNamesAFileBesideTheProgram)
         WriteTextFile(chip_ini, std::string("[AVIFile]\n") + c.entry);
         ResetProgramState("", chip_ini);
         std::string name = strchr(c.entry, '=') ? std::string(strchr(c.entry, '=') + 1, strchr(c.entry, '\n')) : "";
-        if (c.file) WriteTextFile(folder + name, strcmp(c.file, "clip") == 0 ? clip : std::string(c.file));
+        if (c.file && strcmp(c.file, "clip") == 0) ASSERT_TRUE(CopyFileA(clip.c_str(), (folder + name).c_str(), FALSE));
+        else if (c.file) WriteTextFile(folder + name, c.file);
         opened.clear();
         open_hook = SetWindowsHookExA(WH_CALLWNDPROC, RecordOpen, NULL, GetCurrentThreadId());
         RECT rect = {10, 10, 60, 50};
