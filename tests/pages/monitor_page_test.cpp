@@ -85,6 +85,10 @@ TEST_F(MonitorPageTest, TimersAreStoredAndHandedToTheHookLibraryOnApply)
             Click(sheet, IDC_MONITOR_STANDBY_CHECK);
             ExpectTimer(page, standby, true, "1");
             EXPECT_TRUE(ApplyEnabled(sheet));
+            // Leaving the page and coming back applies nothing.
+            PropSheet_SetCurSel(sheet, NULL, PAGE_DESKTOP);
+            PropSheet_SetCurSel(sheet, NULL, PAGE_MONITOR);
+            EXPECT_TRUE(keep_calls.empty());
             PressSheetButton(sheet, PSBTN_APPLYNOW);
         },
         [&](HWND sheet) {
