@@ -4,21 +4,23 @@
 #define VISTREL_TESTS_SIM_TEST_H
 
 #include <gtest/gtest.h>
-#include <windows.h>
-
-#include <string>
 
 #include "hardware/machine.h"
 #include "sim.h"
 #include "support/machine.h"
 #include "support/support.h"
 
-// A 16-bit desktop exercises the clock doubling and the 4-pixel characters.
-inline SimMachineConfig MachineWith(int windows, uint16_t vendor, uint16_t device, int bus = 0, int slot = 10)
+// An S3 card; a 16-bit desktop exercises the clock doubling and the 4-pixel characters.
+inline SimMachineConfig MachineWith(int windows, uint16_t device = 0x8901, int bus = 0, int slot = 10)
 {
-    SimMachineConfig config = Machine(windows, {Card(vendor, device, (uint8_t)bus, (uint8_t)slot)});
+    SimMachineConfig config = Machine(windows, {Card(0x5333, device, (uint8_t)bus, (uint8_t)slot)});
     config.start_bits = 16;
     return config;
+}
+inline void BootWith(int windows, uint16_t device = 0x8901)
+{
+    SimMachineConfig config = MachineWith(windows, device);
+    SimBoot(&config);
 }
 
 // PCI configuration mechanism #1.
@@ -34,11 +36,7 @@ inline void PciWrite(int bus, int device, int offset, uint32_t value)
 }
 
 // Indexed VGA registers of the primary card through the legacy ports.
-inline uint8_t ReadIndexed(uint16_t port, uint8_t index)
-{
-    MachineOutByte(port, index);
-    return MachineInByte(port + 1);
-}
+inline uint8_t ReadIndexed(uint16_t port, uint8_t index) { return MachineOutByte(port, index), MachineInByte(port + 1); }
 inline void WriteIndexed(uint16_t port, uint8_t index, uint8_t value)
 {
     MachineOutByte(port, index);
