@@ -19,18 +19,18 @@ TEST(NtDevice, RequestsAndTheirRefusals)
 {
     SimMachineConfig config = MachineWith(SIM_WINDOWS_NT4, 0x8901, 1, 0);
     SimBoot(&config);
-    HANDLE device = OpenNt();
-    ASSERT_NE(INVALID_HANDLE_VALUE, device);
+    HANDLE nt = OpenNt();
+    ASSERT_NE(INVALID_HANDLE_VALUE, nt);
     uint8_t write[8] = {0xD4, 0x03, 0, 0, 0x13}, out[400];  // port, then the byte
     uint32_t port = 0x3D5, too_wide = 0x10000;
     DWORD got;
-    ASSERT_TRUE(MachineDeviceRequest(device, write_byte, write, 5, NULL, 0, &got));
+    ASSERT_TRUE(MachineDeviceRequest(nt, write_byte, write, 5, NULL, 0, &got));
     // A present card gives its whole header; an empty slot, like HalGetBusData, the invalid vendor id.
     const struct { uint16_t where[2]; DWORD count; uint8_t first[4]; } headers[] = {
         {{1, 0}, 256, {0x33, 0x53, 0x01, 0x89}}, {{0, 20}, 2, {0xFF, 0xFF, 0x5A, 0x5A}}};
     for (const auto& h : headers) {
         memset(out, 0x5A, sizeof out);
-        ASSERT_TRUE(MachineDeviceRequest(device, read_header, (void*)h.where, 4, out, sizeof out, &got));
+        ASSERT_TRUE(MachineDeviceRequest(nt, read_header, (void*)h.where, 4, out, sizeof out, &got));
         EXPECT_EQ(h.count, got);
         EXPECT_EQ(0, memcmp(h.first, out, 4)) << h.count;
         EXPECT_EQ(0x5A, out[h.count]) << "nothing written past the count";
@@ -55,14 +55,14 @@ TEST(NtDevice, RequestsAndTheirRefusals)
     write[4] = 0x77;
     for (const auto& r : refused) {
         SetLastError(0);
-        EXPECT_FALSE(MachineDeviceRequest(device, r.code, r.in, r.in_size, out, r.out_size, &got)) << std::hex << r.code;
-        EXPECT_EQ(r.error, GetLastError()) << std::hex << r.code << std::dec << " in " << r.in_size << " out " << r.out_size;
+        EXPECT_FALSE(MachineDeviceRequest(nt, r.code, r.in, r.in_size, out, r.out_size, &got)) << std::hex << r.code;
+        EXPECT_EQ(r.error, GetLastError()) << std::hex << r.code << std::dec << " " << r.in_size << "/" << r.out_size;
     }
-    EXPECT_FALSE(MachineDeviceRequest(device, write_byte, write, 5, NULL, 0, NULL)) << "no count pointer";
+    EXPECT_FALSE(MachineDeviceRequest(nt, write_byte, write, 5, NULL, 0, NULL)) << "no count pointer";
     EXPECT_EQ((DWORD)ERROR_INVALID_PARAMETER, GetLastError());
     EXPECT_EQ(0x13, MachineInByte(0x3D4)) << "a refused write must not reach the port";
-    EXPECT_TRUE(MachineCloseDevice(device));
-    EXPECT_FALSE(MachineDeviceRequest(device, read_byte, &port, 4, out, 1, &got)) << "a closed handle is gone";
+    EXPECT_TRUE(MachineCloseDevice(nt));
+    EXPECT_FALSE(MachineDeviceRequest(nt, read_byte, &port, 4, out, 1, &got)) << "a closed handle is gone";
     EXPECT_EQ((DWORD)ERROR_INVALID_HANDLE, GetLastError());
 }
 
@@ -72,11 +72,12 @@ TEST(DriverDevices, EachOpensOnlyOnItsWindowsWithTheProgramsFlags)
     EXPECT_EQ(INVALID_HANDLE_VALUE, OpenNt(GENERIC_READ));
     EXPECT_EQ(INVALID_HANDLE_VALUE, OpenNt(GENERIC_READ | GENERIC_WRITE, 0));
     EXPECT_EQ(INVALID_HANDLE_VALUE, OpenVxd()) << "NT has no virtual devices";
-    EXPECT_TRUE(MachineCloseDevice(OpenNt(GENERIC_READ | GENERIC_WRITE, FILE_SHARE_READ | FILE_SHARE_WRITE, "\\\\.\\ZENTRA")));
+    HANDLE h = OpenNt(GENERIC_READ | GENERIC_WRITE, FILE_SHARE_READ | FILE_SHARE_WRITE, "\\\\.\\ZENTRA");
+    EXPECT_TRUE(MachineCloseDevice(h)) << "names are not case-sensitive";
     BootWith(SIM_WINDOWS_98);
     EXPECT_EQ(INVALID_HANDLE_VALUE, OpenVxd(OPEN_EXISTING)) << "9x loads a dynamic device only with CREATE_NEW";
     EXPECT_EQ(INVALID_HANDLE_VALUE, OpenNt()) << "no kernel device on Windows 98";
-    HANDLE h = OpenVxd();
+    h = OpenVxd();
     uint32_t physical = 0xC1000000;
     uint8_t out[5] = {0, 0, 0, 0, 0x5A};
     DWORD got = 0;

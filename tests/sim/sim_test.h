@@ -36,7 +36,7 @@ inline void PciWrite(int bus, int device, int offset, uint32_t value)
 }
 
 // Indexed VGA registers of the primary card through the legacy ports.
-inline uint8_t ReadIndexed(uint16_t port, uint8_t index) { return MachineOutByte(port, index), MachineInByte(port + 1); }
+inline uint8_t ReadIndexed(uint16_t port, uint8_t i) { return MachineOutByte(port, i), MachineInByte(port + 1); }
 inline void WriteIndexed(uint16_t port, uint8_t index, uint8_t value)
 {
     MachineOutByte(port, index);
