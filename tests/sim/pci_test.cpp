@@ -2,7 +2,7 @@
 // and bus 1, empty slots, base address registers as software sizes them.
 #include "sim_test.h"
 
-TEST(Pci, HeadersOfTheChipsetTheCardsAndEmptySlots)
+TEST(Pci, ConfigurationSpaceAndTheWindowsItPlaces)
 {
     SimMachineConfig config = MachineWith(SIM_WINDOWS_98);
     config.cards[config.card_count++] = Card(0x5333, 0x8A20, 1, 0);  // Savage3D behind the AGP bridge
