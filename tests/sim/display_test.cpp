@@ -44,6 +44,7 @@ TEST(Display, EveryS3ChipRunsTheVesaTimingOfEveryListedMode)
             // At 15/16 bits a unit of the total counts two characters of 4 pixels: one off an even count.
             EXPECT_LE(abs(SimHTotal(0) * (m.dmBitsPerPel == 15 || m.dmBitsPerPel == 16 ? 4 : 8) - t->htotal), 4);
             EXPECT_EQ(interlaced ? t->vtotal / 2 : t->vtotal, SimVTotal(0));
+            EXPECT_EQ(m.dmPelsWidth / 8 - 1, SimReadRegister(0, SIM_REG_CRTC, 0x01)) << "display end in characters";
             EXPECT_NEAR(m.dmDisplayFrequency, SimRefreshHz(0), 1.0);
             EXPECT_EQ((int)m.dmDisplayFrequency, MachineScreenRefresh());
         }

@@ -69,6 +69,7 @@ TEST(S3, TotalsAndRefreshFromTheRegisters)
         {0x8901, "16 bits: 4 pixels a character", {cr67_16}, 100, 525, 2 * hz_12h},
         {0x8901, "15 bits: 4 pixels a character", {{SIM_REG_CRTC, 0x67, 0x30}}, 100, 525, 2 * hz_12h},
         {0x8901, "16 bits, SR18: two clocks a pixel", {cr67_16, sr18}, 100, 525, hz_12h},
+        {0x8901, "24 bits, SR18: 8 pixels a character", {{SIM_REG_CRTC, 0x67, 0x70}, sr18}, 100, 525, hz_12h / 2},
         {0x8901, "CR43: 2 x 0x5F + 5 characters", {cr67_16, sr18, cr43}, 195, 525, hz_12h * 100 / 195},
         {0x8901, "CR5D bit 0, CR5E bit 0; CR5F is no part",
          {{SIM_REG_CRTC, 0x5D, 0x01}, {SIM_REG_CRTC, 0x5E, 0x01}, cr5f}, 356, 1549, hz_12h * 100 * 525 / (356 * 1549)},
