@@ -1,90 +1,47 @@
-// The PCI host bridge: configuration mechanism #1, the AGP bridge and bus 1,
-// empty slots, and base address registers as software sizes and moves them.
+// The PCI host bridge: configuration mechanism #1, the chipset, the AGP bridge
+// and bus 1, empty slots, base address registers as software sizes them.
 #include "sim_test.h"
 
-class PciTest : public ::testing::Test {
-protected:
-    void SetUp() override
-    {
-        SimMachineConfig config = MachineWith(SIM_WINDOWS_98, 0x5333, 0x8901, 0, 10);
-        AddCard(&config, 0x5333, 0x8A20, 1, 0);  // Savage3D behind the AGP bridge
-        SimBoot(&config);
-    }
-};
-
-TEST_F(PciTest, IdsOnBothBusesAndNothingInEmptySlots)
+TEST(Pci, ConfigurationSpaceAndTheWindowsItPlaces)
 {
-    EXPECT_EQ(0x89015333u, PciRead(0, 10, 0, 0x00));
-    EXPECT_EQ(0x8A205333u, PciRead(1, 0, 0, 0x00));
-    EXPECT_EQ(0x03000000u, PciRead(0, 10, 0, 0x08) & 0xFFFFFF00u);  // VGA-compatible display controller
-    EXPECT_EQ(0xFFFFFFFFu, PciRead(0, 11, 0, 0x00));
-    EXPECT_EQ(0xFFFFFFFFu, PciRead(1, 10, 0, 0x00)) << "the bus-0 card must not show on bus 1";
-    EXPECT_EQ(0xFFFFFFFFu, PciRead(2, 0, 0, 0x00));
-    EXPECT_EQ(0xFFFFFFFFu, PciRead(0, 10, 1, 0x00)) << "a single-function card has no function 1";
-}
-
-TEST_F(PciTest, AgpBridgeLeadsToBusOne)
-{
-    uint32_t class_code = PciRead(0, 1, 0, 0x08) >> 8;
-    EXPECT_EQ(0x060400u, class_code);
-    uint32_t buses = PciRead(0, 1, 0, 0x18);
-    EXPECT_EQ(0u, buses & 0xFF);           // primary
-    EXPECT_EQ(1u, (buses >> 8) & 0xFF);    // secondary
-    EXPECT_EQ(1u, (buses >> 16) & 0xFF);   // subordinate
-    // The card behind it lies inside the bridge's memory window.
-    uint32_t window = PciRead(0, 1, 0, 0x20);
-    uint32_t base = (window & 0xFFF0) << 16, limit = (window & 0xFFF00000u) | 0xFFFFF;
-    uint32_t bar0 = PciRead(1, 0, 0, 0x10) & 0xFFFFFFF0u;
-    EXPECT_GE(bar0, base);
-    EXPECT_LE(bar0 + 128u * 1024 * 1024 - 1, limit);
-}
-
-TEST_F(PciTest, ByteReadsOfTheDataPortAndTheEnableBit)
-{
+    SimMachineConfig config = MachineWith(SIM_WINDOWS_98);
+    config.cards[config.card_count++] = Card(0x5333, 0x8A20, 1, 0);  // Savage3D behind the AGP bridge
+    SimBoot(&config);
+    const struct { int bus, device, function, offset; uint32_t mask, value; const char* what; } reads[] = {
+        {0, 0, 0, 0x00, ~0u, 0x71908086, "host bridge"},
+        {0, 1, 0, 0x08, ~0xFFu, 0x06040000, "AGP bridge class"},
+        {0, 1, 0, 0x18, 0xFFFFFF, 0x010100, "AGP bridge: bus 0 to bus 1"},
+        {0, 7, 0, 0x0C, 0x800000, 0x800000, "PIIX4: multi-function"},
+        {0, 10, 0, 0x08, ~0xFFu, 0x03000000, "VGA-compatible display controller"},
+        {0, 10, 0, 0x10, 0xF0000000, 0xC0000000, "bus-0 windows from 0xC0000000"},
+        {1, 0, 0, 0x00, ~0u, 0x8A205333, "bus-1 card"},
+        {1, 0, 0, 0x10, 0xF0000000, 0xE0000000, "bus-1 windows from 0xE0000000"},
+        {1, 0, 0, 0x34, 0xFF, 0x44, "AGP card: capability list"},
+        {1, 0, 0, 0x44, 0xFF, 0x02, "AGP capability"},
+        {0, 11, 0, 0x00, ~0u, ~0u, "empty slot"},
+        {1, 10, 0, 0x00, ~0u, ~0u, "the bus-0 card does not show on bus 1"},
+        {0, 10, 1, 0x00, ~0u, ~0u, "a single-function card has no function 1"},
+    };
+    for (const auto& r : reads) EXPECT_EQ(r.value, PciRead(r.bus, r.device, r.function, r.offset) & r.mask) << r.what;
     MachineOutDword(0xCF8, 0x80000000u | 10 << 11);
-    EXPECT_EQ(0x33, MachineInByte(0xCFC));
-    EXPECT_EQ(0x53, MachineInByte(0xCFD));
-    EXPECT_EQ(0x01, MachineInByte(0xCFE));
-    EXPECT_EQ(0x89, MachineInByte(0xCFF));
-    EXPECT_EQ(0x80005000u, MachineInDword(0xCF8)) << "the address register reads back";
+    MachineOutByte(0xCF8, 0);
+    EXPECT_EQ(0x80005000u, MachineInDword(0xCF8)) << "only 32-bit accesses reach the address register";
+    EXPECT_EQ(0x89, MachineInByte(0xCFF)) << "the data port's bytes";
     MachineOutDword(0xCF8, 10 << 11);  // enable bit clear: no configuration cycle
     EXPECT_EQ(0xFFFFFFFFu, MachineInDword(0xCFC));
-}
 
-TEST_F(PciTest, BaseAddressRegistersSizeLikeTheChips)
-{
-    struct {
-        int bus, device;
-        uint32_t mask;
-    } cases[] = {{0, 10, 0xFC000000u}, {1, 0, 0xF8000000u}};
-    for (auto& c : cases) {
-        uint32_t saved = PciRead(c.bus, c.device, 0, 0x10);
-        PciWrite(c.bus, c.device, 0, 0x10, 0xFFFFFFFFu);
-        EXPECT_EQ(c.mask, PciRead(c.bus, c.device, 0, 0x10) & 0xFFFFFFF0u) << "bus " << c.bus;
-        PciWrite(c.bus, c.device, 0, 0x10, saved);
-        EXPECT_EQ(saved, PciRead(c.bus, c.device, 0, 0x10));
-        PciWrite(c.bus, c.device, 0, 0x14, 0xFFFFFFFFu);
-        EXPECT_EQ(0u, PciRead(c.bus, c.device, 0, 0x14)) << "an unimplemented BAR stays 0";
-    }
-    PciWrite(0, 10, 0, 0x00, 0x12345678);
-    EXPECT_EQ(0x89015333u, PciRead(0, 10, 0, 0x00)) << "ids are read-only";
-}
-
-TEST_F(PciTest, RegisterWindowFollowsTheBaseAddressAndMemoryDecode)
-{
-    uint32_t base = SimCardBarAddress(0, 0);
-    uint32_t misc = base + 0x01000000 + 0x8000 + 0x3CC;
-    uint8_t expected = SimReadRegister(0, SIM_REG_MISC, 0);
-    EXPECT_EQ(expected, MachineReadByte(misc));
-
-    uint32_t moved = base + 0x04000000;  // the next 64 MB
-    PciWrite(0, 10, 0, 0x10, moved);
-    EXPECT_EQ(0xFF, MachineReadByte(misc)) << "the old window must be gone";
-    EXPECT_EQ(expected, MachineReadByte(moved + 0x01008000 + 0x3CC));
-
-    uint32_t command = PciRead(0, 10, 0, 0x04);
-    PciWrite(0, 10, 0, 0x04, command & ~2u);  // memory decode off
-    EXPECT_EQ(0xFF, MachineReadByte(moved + 0x01008000 + 0x3CC));
-    PciWrite(0, 10, 0, 0x04, command);
-    EXPECT_EQ(expected, MachineReadByte(moved + 0x01008000 + 0x3CC));
+    PciWrite(1, 0, 0x10, 0xFFFFFFFFu);
+    PciWrite(1, 0, 0x14, 0xFFFFFFFFu);
+    PciWrite(1, 0, 0x00, 0x12345678);
+    EXPECT_EQ(0xF8000000u, PciRead(1, 0, 0, 0x10) & 0xFFFFFFF0u) << "128 MB";
+    EXPECT_EQ(0u, PciRead(1, 0, 0, 0x14)) << "an unimplemented BAR stays 0";
+    EXPECT_EQ(0x8A205333u, PciRead(1, 0, 0, 0x00)) << "ids are read-only";
+    // The register window decodes at the address the BAR holds now, with the memory bit.
+    uint8_t misc = SimReadRegister(0, SIM_REG_MISC, 0);
+    uint32_t bar = SimCardBarAddress(0, 0);
+    PciWrite(0, 10, 0x10, bar + 0x04000000);
+    EXPECT_EQ(0xFF, MachineReadByte(bar + 0x01008000 + 0x3CC)) << "the old window must be gone";
+    EXPECT_EQ(misc, MachineReadByte(bar + 0x05008000 + 0x3CC));
+    PciWrite(0, 10, 0x04, PciRead(0, 10, 0, 0x04) & ~2u);
+    EXPECT_EQ(0xFF, MachineReadByte(bar + 0x05008000 + 0x3CC));
 }
