@@ -1,10 +1,6 @@
 # Test executables (one per folder) and the runs CTest makes of them.
 vistrel_test(shell)
-vistrel_add_test(shell shell FILTER -DetectSystem.*)
-foreach(version 95 98 NT4 modern)
-  vistrel_add_test(shell-detect-${version} shell WINDOWS ${version} FILTER DetectSystem.*)
-  set_property(TEST shell-detect-${version} APPEND PROPERTY ENVIRONMENT VISTREL_EXPECT_WINDOWS=${version})
-endforeach()
+vistrel_add_test(shell shell)
 
 # The product's runtime body, built for this machine without a C runtime,
 # held against the standard body.
