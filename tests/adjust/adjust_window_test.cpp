@@ -6,51 +6,37 @@
 
 namespace {
 
-// The hook answers the save question with `answer`, or with Enter (0), which
-// takes the default button, and notes what the question said.
+// The hook answers the adjustment window's save question with `answer`, or
+// with Enter (0), which takes the default button, and notes what it said.
 struct { int answer, count; HWND box; char caption[64], text[64]; } question;
-HHOOK question_hook;
-
 LRESULT CALLBACK AnswerQuestion(int code, WPARAM wparam, LPARAM lparam)
 {
-    char cls[8] = "";
-    if (code == HCBT_ACTIVATE && (HWND)wparam != question.box) GetClassNameA((HWND)wparam, cls, sizeof cls);
-    if (strcmp(cls, "#32770") == 0) {
+    HWND box = (HWND)wparam, owner = GetWindow(box, GW_OWNER);
+    if (code == HCBT_ACTIVATE && box != question.box && owner && owner == FindWindowA(adjust_window_class, NULL)) {
         ++question.count;
-        GetWindowTextA(question.box = (HWND)wparam, question.caption, sizeof question.caption);
-        GetDlgItemTextA(question.box, 0xFFFF, question.text, sizeof question.text);
-        if (question.answer) PostMessageA(question.box, WM_COMMAND, question.answer, 0);
-        else PostMessageA(question.box, WM_KEYDOWN, VK_RETURN, 0);
+        GetWindowTextA(question.box = box, question.caption, sizeof question.caption);
+        GetDlgItemTextA(box, 0xFFFF, question.text, sizeof question.text);
+        if (question.answer) PostMessageA(box, WM_COMMAND, question.answer, 0);
+        else PostMessageA(box, WM_KEYDOWN, VK_RETURN, 0);
     }
-    return CallNextHookEx(question_hook, code, wparam, lparam);
+    return CallNextHookEx(NULL, code, wparam, lparam);
+}
+const HHOOK question_hook = SetWindowsHookExA(WH_CBT, AnswerQuestion, NULL, GetCurrentThreadId());
+
+// Presses keys, each so many times, in the window, or in a new one: the window.
+HWND Keys(std::initializer_list<std::pair<WPARAM, int>> presses, HWND window = NULL)
+{
+    if (!window) {
+        question = {question.answer};
+        EXPECT_EQ(1, OpenAdjustWindow(NULL));
+        window = FindWindowA(adjust_window_class, NULL);
+    }
+    for (auto [key, times] : presses)
+        while (times--) SendMessageA(window, WM_KEYDOWN, key, 1);
+    return window;
 }
 
-class AdjustWindowTest : public AdjustTest {
-protected:
-    void SetUp() override
-    {
-        AdjustTest::SetUp();
-        question = {};
-        question_hook = SetWindowsHookExA(WH_CBT, AnswerQuestion, NULL, GetCurrentThreadId());
-    }
-    void TearDown() override
-    {
-        DestroyWindow(FindWindowA(adjust_window_class, NULL));
-        UnhookWindowsHookEx(question_hook);
-        AdjustTest::TearDown();
-    }
-    // Presses keys, each so many times, in the window, or in a new one: the window.
-    static HWND Keys(std::initializer_list<std::pair<WPARAM, int>> presses, HWND window = NULL)
-    {
-        if (!window) EXPECT_EQ(1, OpenAdjustWindow(NULL));
-        if (!window) window = FindWindowA(adjust_window_class, NULL);
-        for (auto [key, times] : presses)
-            while (times--) SendMessageA(window, WM_KEYDOWN, key, 1);
-        return window;
-    }
-};
-
-TEST_F(AdjustWindowTest, ArrowsStepWithin21EachWayAndEscapeUndoes)
+TEST_F(AdjustTest, ArrowsStepWithin21EachWayAndEscapeUndoes)
 {
     SetRoomyCrt();
     HWND window = Keys({{VK_UP, 22}});
@@ -69,8 +55,9 @@ TEST_F(AdjustWindowTest, ArrowsStepWithin21EachWayAndEscapeUndoes)
 
 // Only a move is asked about. A refused step beeps. The offsets outlive the
 // window until the Monitor page's Default; the texts are cut to their buffers.
-TEST_F(AdjustWindowTest, EnterAsksWithNoAsTheDefaultAndYesStores)
+TEST_F(AdjustTest, EnterAsksWithNoAsTheDefaultAndYesStores)
 {
+    question.answer = 0;
     EXPECT_TRUE(!IsWindow(Keys({{VK_RETURN, 1}})) && question.count == 0);
     HWND window = Keys({{VK_RIGHT, 5}, {VK_RETURN, 1}});  // and Enter in the question
     EXPECT_TRUE(beep_count == 1 && Crtc(0x04) == 0x80 && adjust_offset_h == -4);
@@ -98,8 +85,9 @@ TEST_F(AdjustWindowTest, EnterAsksWithNoAsTheDefaultAndYesStores)
               std::string(t.up) + "|" + t.down + "|" + t.left + "|" + t.right + "|" + t.cancel + "|" + t.save);
 }
 
-// The nested rectangles' corners sit on the diagonals whatever the proportions.
-TEST(AdjustPicture, NestedRectanglesSitOnTheDiagonals)
+// The nested rectangles' corners sit on the diagonals whatever the proportions;
+// the key legend is centred in the lowest fifth.
+TEST(AdjustPicture, RectanglesOnTheDiagonalsAndTheLegendBelow)
 {
     for (SIZE screen : {SIZE{640, 480}, SIZE{1024, 768}, SIZE{1280, 1024}, SIZE{1600, 1200}, SIZE{1280, 720}}) {
         const int w = screen.cx, h = screen.cy;
@@ -116,20 +104,11 @@ TEST(AdjustPicture, NestedRectanglesSitOnTheDiagonals)
         EXPECT_NEAR(20.0 * h / w, y1, 1.0) << w << "x" << h;
         EXPECT_NEAR(40.0 * h / w, y3, 1.0) << w << "x" << h;
         EXPECT_TRUE(white(x, y1) && white(x, y3) && !white(x, y1 + 1)) << w << "x" << h;
+        LegendLayout at = ComputeLegendLayout(w, h, 30, 60, 12);  // "Right" 30 wide, sample text 60 x 12
+        EXPECT_TRUE(abs(w - 2 * at.x0 - 3 * at.column - 12 - 30) <= 1 && at.row1_y >= h * 4 / 5 - 1 &&
+                    at.row2_y + at.glyph <= h) << w << "x" << h;
         DeleteObject(SelectObject(dc, old));
         DeleteDC(dc);
-    }
-}
-
-// The key legend is centred in the lowest fifth, its rows two text lines
-// apart; too wide, it starts at the left edge with narrower columns.
-TEST(AdjustPicture, LegendCentredInTheLowestFifth)
-{
-    static const struct { int width, x0, column; } cases[] = {{1000, 209, 180}, {582, 0, 180}, {500, 0, 170}};
-    for (const auto& c : cases) {
-        LegendLayout at = ComputeLegendLayout(c.width, 500, 30, 60, 12);  // "Right" 30 wide, sample 60 x 12
-        EXPECT_TRUE(at.x0 == c.x0 && at.column == c.column && at.glyph == 12) << c.width;
-        EXPECT_TRUE(at.row1_y == 400 && at.row2_y == 424) << c.width;
     }
 }
 

@@ -35,7 +35,7 @@ struct Step { int picture; uint8_t cr04; unsigned vretrace; POINT press; bool re
 const POINT none = {-1, -1}, up_arrow = {87, 20}, down_arrow = {87, 140}, left_arrow = {20, 81},
             right_arrow = {150, 81}, auto_button = {87, 81};
 const Step* script;
-size_t steps_left, step;
+size_t script_length, step;
 
 // The frame is teal around the pad, and the pad shows the picture.
 void ExpectPainted(HWND dialog, int id)
@@ -55,7 +55,7 @@ void ExpectPainted(HWND dialog, int id)
 // The dialog tells its owner each time it has nothing left to do.
 LRESULT CALLBACK OwnerProc(HWND window, UINT message, WPARAM wparam, LPARAM lparam)
 {
-    if (message != WM_ENTERIDLE || !steps_left) return DefWindowProcA(window, message, wparam, lparam);
+    if (message != WM_ENTERIDLE || step == script_length) return DefWindowProcA(window, message, wparam, lparam);
     HWND d = (HWND)lparam;
     const Step& s = script[step];
     EXPECT_EQ(s.picture, PanningDialogState()->picture) << step;
@@ -67,21 +67,19 @@ LRESULT CALLBACK OwnerProc(HWND window, UINT message, WPARAM wparam, LPARAM lpar
     if (s.press.x >= 0) PostMessageA(d, WM_LBUTTONDOWN, MK_LBUTTON, MAKELPARAM(at.x, at.y));
     if (s.release) PostMessageA(d, WM_LBUTTONUP, 0, 0);
     if (s.command) PostMessageA(d, WM_COMMAND, s.command, 0);
-    --steps_left;
     return 0;
 }
 
-template <size_t N>
-int RunScript(const Step (&steps)[N])
+int RunScript(const Step* steps, size_t length)
 {
     HWND owner = CreateWindowA("STATIC", "", WS_POPUP, 0, 0, 0, 0, NULL, NULL, NULL, NULL);
     SetWindowLongPtrA(owner, GWLP_WNDPROC, (LONG_PTR)OwnerProc);
     script = steps;
-    steps_left = N;
+    script_length = length;
     step = 0;
     int result = OpenPanningDialog(owner, "Panning under test");
     DestroyWindow(owner);
-    EXPECT_EQ(0u, steps_left) << "every step ran";
+    EXPECT_EQ(length, step) << "every step ran";
     return result;
 }
 
@@ -99,13 +97,14 @@ TEST_F(PanningDialogTest, ArrowsStepAutoGoesBackSaveStoresAndCancelUndoes)
         {AUTO, 0x80, 771, auto_button, true, 0},  // AUTO went back and stays up; the second lets go
         {NORMAL, 0x80, 771, up_arrow, true, 0},     {NORMAL, 0x80, 772, none, false, IDC_PANNING_SAVE},
     };
-    EXPECT_EQ(1, RunScript(steps));
+    EXPECT_EQ(1, RunScript(steps, std::size(steps)));
     int value = 0;
     EXPECT_TRUE(!StoredValue("1024x768x16x75H", &value) && beep_count == 0);
     ASSERT_TRUE(StoredValue("1024x768x16x75V", &value));
     EXPECT_TRUE(value == Crtc(0x10) + 256 * Crtc(0x07) && VerticalRetrace() == 772);
-    static const Step cancelled[] = {{NORMAL, 0x80, 772, left_arrow, true, 0}, {NORMAL, 0x81, 772, none, false, IDCANCEL}};
-    EXPECT_EQ(0, RunScript(cancelled));
+    static const Step cancelled[] = {{NORMAL, 0x80, 772, left_arrow, true, 0},
+                                     {NORMAL, 0x81, 772, none, false, IDCANCEL}};
+    EXPECT_EQ(0, RunScript(cancelled, 2));
     EXPECT_TRUE(Crtc(0x04) == 0x80 && !StoredValue("1024x768x16x75H", &value)) << "undone";
 }
 
