@@ -36,7 +36,7 @@ TEST(Runtime, FormatText)
         {0, NULL, FORMAT("%d", 5)}, {OUT_SIZE, w1023.c_str(), FORMAT("%s", w1500.c_str())},
         {OUT_SIZE, w1020_cut.c_str(), FORMAT("%s|%d", w1020.c_str(), 12345)},
     };
-    for (const Body& b : bodies) {
+    for (const Body& b : bodies)
         for (const auto& c : cases) {
             char out[OUT_SIZE];
             memset(out, JUNK, sizeof out);
@@ -45,11 +45,9 @@ TEST(Runtime, FormatText)
             if (c.expected) want.replace(0, strlen(c.expected) + 1, c.expected, strlen(c.expected) + 1);
             EXPECT_EQ(want, std::string(out, OUT_SIZE)) << b.name << (c.expected ? c.expected : " (nothing)");
         }
-    }
 }
 
-// Offsets of what is found, -1 for nothing.
-static long At(const char* text, const char* found) { return found ? (long)(found - text) : -1; }
+static long At(const char* text, const char* found) { return found ? (long)(found - text) : -1; }  // -1: none
 
 TEST(Runtime, SearchesComparisonsAndMemory)
 {
@@ -72,8 +70,7 @@ TEST(Runtime, SearchesComparisonsAndMemory)
         }
         for (const auto& c : comparisons) EXPECT_EQ(c.same, b.SameText(c.a, c.b, c.length)) << c.a << c.length;
         char path[16] = "Class\\", key[] = "pci\\ven_5333&dev_8a01";
-        EXPECT_TRUE(b.AppendText(path, 14, "DEFAULT"));
-        EXPECT_FALSE(b.AppendText(path, 14, "X")) << "only all of it, with its terminator";
+        EXPECT_TRUE(b.AppendText(path, 14, "DEFAULT") && !b.AppendText(path, 14, "X")) << "all, or none";
         EXPECT_STREQ("Class\\DEFAULT", path);
         b.UpperText(key);
         EXPECT_STREQ("PCI\\VEN_5333&DEV_8A01", key);

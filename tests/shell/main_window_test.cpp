@@ -17,8 +17,7 @@ TEST(Tray, MainWindowSpotIsTheCornerAtTheFarEndOfTheTaskbar)
         {{0, 0, 30, 768}, 0, 767}, {{-2, -2, 1026, 28}, 1023, 0}};           // left, top
     for (const auto& c : cases) {
         TaskbarPlace place = {1024, 768, c.taskbar};
-        POINT p = MainWindowSpot(&place);
-        EXPECT_TRUE(p.x == c.x && p.y == c.y) << c.taskbar.left << "," << c.taskbar.top << ": " << p.x << "," << p.y;
+        EXPECT_TRUE(MainWindowSpot(&place).x == c.x && MainWindowSpot(&place).y == c.y) << &c - cases;
     }
 }
 
@@ -43,8 +42,7 @@ TEST(MainWindow, RedrawReappliesAfterQuietTimeWithTheTrayFree)
     SaveSetting(SETTING_POSITION_H, driver + 2);
     static const struct { uint16_t state; DWORD quiet_ms; bool off_spot, applied; } cases[] = {
         {STATE_TRAY_BUSY, 10000, false, false},  // the redraw that the taskbar query causes
-        {0, 1000, false, false}, {0, 10000, true, false},  // a move comes first: its own redraw re-applies
-        {0, 10000, false, true}};
+        {0, 1000, false, false}, {0, 10000, true, false}, {0, 10000, false, true}};  // a move first, then its redraw
     for (const auto& c : cases) {
         SimWriteRegister(0, SIM_REG_CRTC, 0x04, driver);
         if (c.off_spot) MoveWindow(window, 0, 0, 1, 1, FALSE);
@@ -78,10 +76,14 @@ TEST(MainWindow, DisplayChangeRereadsTheModesButOnNTInPlace)
     }
 }
 
-// Any process may send it: only the four DPMS states reach the cards.
-TEST(MainWindow, PowerStateMessageCarriesOutOnlyDpmsStates)
+// Created, the window uses up the "/A" switch; only the four DPMS states that any
+// process may ask for reach the cards; destroyed, it ends the program with 0.
+TEST(MainWindow, FromCreationToTheEndOnlyDpmsStatesReachTheCards)
 {
     ASSERT_NO_FATAL_FAILURE(Boot(SIM_WINDOWS_98));
+    startup_flags = STARTUP_AUTORUN;
+    MainWindowProc(window, WM_CREATE, 0, 0);
+    EXPECT_EQ(0u, startup_flags);
     static const struct { WPARAM state; SimDpms dpms; } cases[] = {
         {1, SIM_DPMS_STANDBY}, {3, SIM_DPMS_STANDBY}, {2, SIM_DPMS_SUSPEND},
         {(WPARAM)0x100000004ull, SIM_DPMS_SUSPEND}, {4, SIM_DPMS_OFF}, {0, SIM_DPMS_ON}};
@@ -89,4 +91,7 @@ TEST(MainWindow, PowerStateMessageCarriesOutOnlyDpmsStates)
         EXPECT_EQ(1, MainWindowProc(window, MSG_POWER_STATE, c.state, 0)) << c.state;
         EXPECT_EQ(c.dpms, SimDpmsState(0)) << c.state;
     }
+    MainWindowProc(window, WM_DESTROY, 0, 0);
+    MSG quit;
+    EXPECT_TRUE(PeekMessageA(&quit, NULL, WM_QUIT, WM_QUIT, PM_REMOVE) && quit.wParam == 0);
 }

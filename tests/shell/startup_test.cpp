@@ -1,5 +1,4 @@
-// Start-up: the switch, the operating-system check, the INI paths and the
-// second start that wakes the running copy.
+// Start-up: the switch, the system check, the INI paths, a second start waking the running copy.
 #include <gtest/gtest.h>
 
 #include "base/state.h"
@@ -20,8 +19,7 @@ TEST(Startup, WakeClickKeepsOffTheEdges)
         {9, 501, 19, 491}, {10, 500, 10, 500}, {500, 10, 500, 10}, {501, 9, 491, 19}};
     for (const auto& c : cases) {
         RECT r = {c.left, c.top, c.left + 1, c.top + 1};
-        POINT p = WakePoint(&r);
-        EXPECT_TRUE(p.x == c.x && p.y == c.y) << c.left << "," << c.top;
+        EXPECT_TRUE(WakePoint(&r).x == c.x && WakePoint(&r).y == c.y) << c.left << "," << c.top;
     }
 }
 
