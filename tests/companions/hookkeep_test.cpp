@@ -10,6 +10,27 @@
 
 namespace {
 
+// A stored 0 is off too: armed, it would enter standby at once. First, before any test makes input.
+TEST(PowerTimers, StartArmsTheTimersStoredAboveZeroAndStopEndsWatching)
+{
+    HWND window = CreatePowerWindow();
+    power_minute_length = UNIT_MINUTE;
+    ClearSettingsStore();
+    SaveSetting(SETTING_STANDBY, 0);
+    SaveSetting(SETTING_SUSPEND, 1);
+    SaveSetting(SETTING_SHUTOFF, 3);
+    DWORD start = GetTickCount();
+    EXPECT_EQ(1, StartPowerTimers(window, 1));
+    std::vector<DWORD> at;
+    EXPECT_EQ((std::vector<int>{2, 4}), CollectPowerPosts(window, 2, LATE_MS, &at));
+    EXPECT_TRUE(at.size() == 2 && at[0] - start >= 1u * UNIT_MS && at[1] - start >= 3u * UNIT_MS);
+    EXPECT_EQ(1, StartPowerTimers(window, 0));
+    EXPECT_EQ(0u, SetKeepHook(NULL, KEEP_STATE_SUSPEND, 1, 0)) << "the library is stopped";
+    DestroyPowerWindow(window);
+    power_minute_length = KEEP_REAL_MINUTE;
+    ClearSettingsStore();
+}
+
 class HookKeep : public testing::Test {
 protected:
     // Started for a window that has the keyboard, the cursor still where NudgeMouse may move it.
@@ -36,9 +57,8 @@ protected:
 
 TEST_F(HookKeep, IdleEntersEachArmedStateOnceInTheOrderTheyRunOutButNeverALighterOne)
 {
-    // Wide apart where the next call must come before a timer runs out.
     static const struct {
-        DWORD arm[3][3];  // state, enable, minutes
+        DWORD arm[3][3];  // state, enable, minutes; wide apart where a call must come before a timer runs out
         std::vector<int> states;
         DWORD after[3];  // in timer minutes
     } cases[] = {
@@ -99,27 +119,7 @@ TEST_F(HookKeep, KeyPressInAnotherProcessWakes)
     EXPECT_EQ((std::vector<int>{KEEP_STATE_STANDBY}), CollectPowerPosts(window, 1, 0)) << "at once";
     PressShift();
     EXPECT_EQ((std::vector<int>{0}), CollectPowerPosts(window, 1, LATE_MS));
-}
-
-// A stored 0 is off too: armed, it would enter standby at once.
-TEST(PowerTimers, StartArmsTheTimersStoredAboveZeroAndStopEndsWatching)
-{
-    HWND window = CreatePowerWindow();
-    power_minute_length = UNIT_MINUTE;
-    ClearSettingsStore();
-    SaveSetting(SETTING_STANDBY, 0);
-    SaveSetting(SETTING_SUSPEND, 1);
-    SaveSetting(SETTING_SHUTOFF, 3);
-    DWORD start = GetTickCount();
-    EXPECT_EQ(1, StartPowerTimers(window, 1));
-    std::vector<DWORD> at;
-    EXPECT_EQ((std::vector<int>{2, 4}), CollectPowerPosts(window, 2, LATE_MS, &at));
-    EXPECT_TRUE(at.size() == 2 && at[0] - start >= 1u * UNIT_MS && at[1] - start >= 3u * UNIT_MS);
-    EXPECT_EQ(1, StartPowerTimers(window, 0));
-    EXPECT_EQ(0u, SetKeepHook(NULL, KEEP_STATE_SUSPEND, 1, 0)) << "the library is stopped";
-    DestroyPowerWindow(window);
-    power_minute_length = KEEP_REAL_MINUTE;
-    ClearSettingsStore();
+    EXPECT_TRUE(Quiet(10)) << "once, and the key's release is heard before the next test";
 }
 
 // After a start that failed, the program's timer calls for the same window must
