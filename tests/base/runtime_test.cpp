@@ -1,7 +1,6 @@
 // The product's runtime body (USER32 and KERNEL32; here a DLL without any C
 // runtime) and the standard body of the other builds: the same bytes from both.
 #include <gtest/gtest.h>
-#include <limits.h>
 #include <windows.h>
 
 #include <string>
@@ -28,7 +27,7 @@ TEST(Runtime, FormatText)
 {
     static const struct { size_t size; const char* expected; int (*call)(FormatFn, char*, size_t); } cases[] = {
         {64, "SOFTWARE\\QUORVEL\\PANEL\\53338811", FORMAT("%s\\%04x%04x", "SOFTWARE\\QUORVEL\\PANEL", 0x5333, 0x8811)},
-        {16, "-2147483648", FORMAT("%d", INT_MIN)}, {16, "-7|4294967295", FORMAT("%d|%u", -7, 0xFFFFFFFFu)},
+        {16, "-2147483648", FORMAT("%d", INT32_MIN)}, {16, "-7|4294967295", FORMAT("%d|%u", -7, 0xFFFFFFFFu)},
         {32, "ffffffff|ABCDEF|12345", FORMAT("%x|%X|%04x", -1, 0xABCDEF, 0x12345)},
         {32, "[   42|42   |00042]", FORMAT("[%5d|%-5d|%05d]", 42, 42, 42)},
         {32, "[      ab|abcd|z]", FORMAT("[%8s|%-3s|%c]", "ab", "abcd", 'z')},

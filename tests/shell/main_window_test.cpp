@@ -1,6 +1,7 @@
 // The hidden main window: its place, what redraws and display changes re-apply, the power states.
 #include <gtest/gtest.h>
 
+#include "../../companions/hookkeep.h"
 #include "base/adapters.h"
 #include "base/settings.h"
 #include "base/state.h"
@@ -53,7 +54,6 @@ TEST(MainWindow, RedrawReappliesAfterQuietTimeWithTheTrayFree)
         EXPECT_LE(GetTickCount() - last_activity_tick, 100u) << "activity, or the re-application, is new";
         EXPECT_EQ(0, PlaceMainWindow(window)) << "back at its spot";
     }
-    shell_state = 0;
     ClearSettingsStore();
 }
 
@@ -76,14 +76,14 @@ TEST(MainWindow, DisplayChangeRereadsTheModesButOnNTInPlace)
     }
 }
 
-// Created, the window uses up the "/A" switch; only the four DPMS states that any
-// process may ask for reach the cards; destroyed, it ends the program with 0.
+// Created, the window starts the power timers and uses up "/A"; only the four DPMS states that any process
+// may ask for reach the cards; destroyed, it stops the timers and ends the program with 0.
 TEST(MainWindow, FromCreationToTheEndOnlyDpmsStatesReachTheCards)
 {
     ASSERT_NO_FATAL_FAILURE(Boot(SIM_WINDOWS_98));
     startup_flags = STARTUP_AUTORUN;
     MainWindowProc(window, WM_CREATE, 0, 0);
-    EXPECT_EQ(0u, startup_flags);
+    EXPECT_TRUE(startup_flags == 0 && SetKeepHook(NULL, KEEP_STATE_SUSPEND, 0, 0) == 1);
     static const struct { WPARAM state; SimDpms dpms; } cases[] = {
         {1, SIM_DPMS_STANDBY}, {3, SIM_DPMS_STANDBY}, {2, SIM_DPMS_SUSPEND},
         {(WPARAM)0x100000004ull, SIM_DPMS_SUSPEND}, {4, SIM_DPMS_OFF}, {0, SIM_DPMS_ON}};
@@ -92,6 +92,7 @@ TEST(MainWindow, FromCreationToTheEndOnlyDpmsStatesReachTheCards)
         EXPECT_EQ(c.dpms, SimDpmsState(0)) << c.state;
     }
     MainWindowProc(window, WM_DESTROY, 0, 0);
+    EXPECT_EQ(0u, SetKeepHook(NULL, KEEP_STATE_SUSPEND, 0, 0));
     MSG quit;
     EXPECT_TRUE(PeekMessageA(&quit, NULL, WM_QUIT, WM_QUIT, PM_REMOVE) && quit.wParam == 0);
 }
