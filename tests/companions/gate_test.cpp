@@ -37,7 +37,7 @@ const bool no_real_restart = (restart_windows = RecordRestart) != NULL;  // from
 
 TEST(Gatectl, ParsesOnlyItsTwoCommands)
 {
-    std::string long_class(300, 'c'), long_line = "3 " + long_class;
+    std::string long_class(GATE_CLASS_SIZE, 'c'), long_line = "3 " + long_class;  // one more than fits
     const struct { const char* arguments; int command; std::string window_class; } cases[] = {
         {"2 restart", GATE_RESTART, ""},   {"  2\tRESTART  ", GATE_RESTART, ""}, {"2", GATE_NONE, ""},
         {"2 restarts", GATE_NONE, ""},     {"2 restart now", GATE_NONE, ""},     {"22 restart", GATE_NONE, ""},
