@@ -4,8 +4,6 @@
 #define VISTREL_ADJUST_TEST_H
 
 #include <gtest/gtest.h>
-#include <stdint.h>
-#include <stdlib.h>
 #include <windows.h>
 
 #include "adjust/adjust_window.h"
