@@ -1,177 +1,166 @@
-// gatectl.exe: its command lines and restart in-process, its memory answer
-// from the real program. The real program is never given "2": a restart
-// would end the whole Wine session.
+// gatectl.exe, whose work is linked in here, and the program's calls of it, with
+// a stand-in beside the test program. Nothing may restart the Wine session: the
+// real gatectl.exe is never given "2", and every restart goes to a recorder.
 #include <gtest/gtest.h>
 
-#include <string.h>
-
 #include "../../companions/gate.h"
+#include "base/protocol.h"
+#include "hardware/companions.h"
 #include "power_window.h"
-#include "shell/main_window.h"
+#include "support/support.h"
 
 namespace {
 
-struct ParseCase {
-    const char* arguments;
-    int command;
-    const char* window_class;
-};
-
-const ParseCase parse_cases[] = {
-    {"2 restart", GATE_RESTART, ""},
-    {"  2\trestart  ", GATE_RESTART, ""},
-    {"2", GATE_NONE, ""},
-    {"2 restarts", GATE_NONE, ""},
-    {"2 restart now", GATE_NONE, ""},
-    {"22 restart", GATE_NONE, ""},
-    {"3 zentra", GATE_MEMORY, "zentra"},
-    {"3 \"two words\"", GATE_MEMORY, "two words"},
-    {"3", GATE_NONE, ""},
-    {"3 \"\"", GATE_NONE, ""},
-    {"1 zentra", GATE_NONE, ""},
-    {"", GATE_NONE, ""},
-};
-
-TEST(ParseGateCommand, KnowsOnlyItsTwoCommands)
-{
-    for (const ParseCase& c : parse_cases) {
-        GateRequest request;
-        memset(&request, 0x55, sizeof request);
-        EXPECT_EQ(c.command, ParseGateCommand(c.arguments, &request)) << '"' << c.arguments << '"';
-        EXPECT_EQ(c.command, request.command) << '"' << c.arguments << '"';
-        EXPECT_STREQ(c.window_class, request.window_class) << '"' << c.arguments << '"';
-    }
-    GateRequest request;
-    EXPECT_EQ(GATE_NONE, ParseGateCommand(NULL, &request));
-}
-
-TEST(PackMemorySize, WholeMegabytesAndKilobytesInStepsOf64)
-{
-    EXPECT_EQ(0x40000u, PackMemorySize(4u << 20));
-    EXPECT_EQ((8u << 16) | 512, PackMemorySize((8u << 20) + (512u << 10)));
-    EXPECT_EQ((7u << 16) | 960, PackMemorySize((8u << 20) - (40u << 10)));
-    EXPECT_EQ(0u, PackMemorySize(63u << 10));
-}
-
-// Stands in for ExitWindowsEx and notes what the restart had done by then.
-struct ExitRecord {
-    int calls;
-    UINT flags;
-    DWORD reason;
-    bool privilege_enabled;
-    BOOL answer;
-};
-ExitRecord exit_record;
-
-bool ShutdownPrivilegeEnabled()
+// The shutdown privilege is enabled; disable_all first turns every privilege off.
+bool ShutdownPrivilege(bool disable_all = false)
 {
     HANDLE token;
-    if (!OpenProcessToken(GetCurrentProcess(), TOKEN_QUERY, &token)) return false;
-    PRIVILEGE_SET wanted = {};
-    wanted.PrivilegeCount = 1;
-    wanted.Control = PRIVILEGE_SET_ALL_NECESSARY;
+    if (!OpenProcessToken(GetCurrentProcess(), TOKEN_QUERY | TOKEN_ADJUST_PRIVILEGES, &token)) return false;
+    if (disable_all) AdjustTokenPrivileges(token, TRUE, NULL, 0, NULL, NULL);
+    PRIVILEGE_SET wanted = {1, PRIVILEGE_SET_ALL_NECESSARY, {}};
     LookupPrivilegeValueA(NULL, SE_SHUTDOWN_NAME, &wanted.Privilege[0].Luid);
     BOOL held = FALSE;
     PrivilegeCheck(token, &wanted, &held);
     CloseHandle(token);
-    return held != FALSE;
+    return held;
 }
 
-void DisableShutdownPrivilege()
+struct { int calls; UINT flags; DWORD reason; bool privilege; BOOL answer; } restart;
+
+BOOL WINAPI RecordRestart(UINT flags, DWORD reason)
 {
-    HANDLE token;
-    ASSERT_TRUE(OpenProcessToken(GetCurrentProcess(), TOKEN_ADJUST_PRIVILEGES, &token));
-    TOKEN_PRIVILEGES privileges = {};
-    privileges.PrivilegeCount = 1;
-    LookupPrivilegeValueA(NULL, SE_SHUTDOWN_NAME, &privileges.Privileges[0].Luid);
-    AdjustTokenPrivileges(token, FALSE, &privileges, 0, NULL, NULL);
-    CloseHandle(token);
+    restart = {restart.calls + 1, flags, reason, ShutdownPrivilege(), restart.answer};
+    return restart.answer;
 }
 
-BOOL WINAPI RecordExit(UINT flags, DWORD reason)
+const bool no_real_restart = (restart_windows = RecordRestart) != NULL;  // from the start of this program
+
+TEST(Gatectl, ParsesOnlyItsTwoCommands)
 {
-    ++exit_record.calls;
-    exit_record.flags = flags;
-    exit_record.reason = reason;
-    exit_record.privilege_enabled = ShutdownPrivilegeEnabled();
-    return exit_record.answer;
+    std::string long_class(GATE_CLASS_SIZE, 'c'), long_line = "3 " + long_class;  // one more than fits
+    const struct { const char* arguments; int command; std::string window_class; } cases[] = {
+        {"2 restart", GATE_RESTART, ""},   {"  2\tRESTART  ", GATE_RESTART, ""}, {"2", GATE_NONE, ""},
+        {"2 restarts", GATE_NONE, ""},     {"2 restart now", GATE_NONE, ""},     {"22 restart", GATE_NONE, ""},
+        {"3 zentra \t", GATE_MEMORY, "zentra"}, {"3 \"two words\"", GATE_MEMORY, "two words"},
+        {"3 \"", GATE_MEMORY, "\""},       {"3 \"\"", GATE_NONE, ""},            {"3", GATE_NONE, ""},
+        {"1 zentra", GATE_NONE, ""},       {"", GATE_NONE, ""},                  {NULL, GATE_NONE, ""},
+        {long_line.c_str(), GATE_MEMORY, long_class.substr(0, GATE_CLASS_SIZE - 1)},
+    };
+    for (const auto& c : cases) {
+        GateRequest request;
+        memset(&request, 0x55, sizeof request);
+        EXPECT_EQ(c.command, ParseGateCommand(c.arguments, &request)) << (c.arguments ? c.arguments : "NULL");
+        EXPECT_EQ(c.command, request.command) << (c.arguments ? c.arguments : "NULL");
+        EXPECT_EQ(c.window_class, request.window_class) << (c.arguments ? c.arguments : "NULL");
+    }
+    EXPECT_EQ((8u << 16) | 512, PackMemorySize((8u << 20) + (575u << 10))) << "megabytes, and kilobytes by 64";
+    EXPECT_EQ((7u << 16) | 960, PackMemorySize((8u << 20) - (40u << 10)));
 }
 
 // NT refuses the restart without the privilege; Windows 9x has none to take.
-TEST(RestartWindows, RebootsWithTheShutdownPrivilegeWhereThereIsOne)
+TEST(Gatectl, RestartRebootsWithTheShutdownPrivilegeWhereThereIsOne)
 {
-    OSVERSIONINFOA version = {};
-    version.dwOSVersionInfoSize = sizeof version;
+    OSVERSIONINFOA version = {sizeof version};
     GetVersionExA(&version);
-    bool nt = version.dwPlatformId == VER_PLATFORM_WIN32_NT;
-    DisableShutdownPrivilege();
-    ASSERT_FALSE(ShutdownPrivilegeEnabled());
-    exit_record = {0, 0, 1, false, TRUE};
-    EXPECT_EQ(1, RestartWindows(RecordExit));
-    EXPECT_EQ(1, exit_record.calls);
-    EXPECT_EQ((UINT)EWX_REBOOT, exit_record.flags);
-    EXPECT_EQ(0u, exit_record.reason);
-    EXPECT_EQ(nt, exit_record.privilege_enabled);
-
-    exit_record = {0, 0, 1, false, FALSE};
-    EXPECT_EQ(0, RestartWindows(RecordExit));
-    EXPECT_EQ(1, exit_record.calls);
+    for (BOOL answer : {TRUE, FALSE}) {
+        ASSERT_FALSE(ShutdownPrivilege(true));
+        restart = {0, 0, 1, false, answer};
+        EXPECT_EQ(answer, RestartWindows(RecordRestart));
+        EXPECT_TRUE(restart.calls == 1 && restart.flags == EWX_REBOOT && restart.reason == 0);
+        EXPECT_EQ(version.dwPlatformId == VER_PLATFORM_WIN32_NT, restart.privilege);
+    }
 }
 
-std::string RealGatectl()
-{
-    std::string path = "Z:" VISTREL_SIM_DIR "/gatectl.exe";
-    for (char& c : path)
-        if (c == '/') c = '\\';
-    return path;
-}
-
-// Runs the real gatectl.exe with these arguments to its end; its exit code.
-// Its answer, a post, waits in this thread's queue.
-DWORD RunGatectl(const char* arguments)
-{
-    std::string program = RealGatectl();
-    std::string command = std::string("gatectl.exe ") + arguments;
-    STARTUPINFOA startup = {};
-    startup.cb = sizeof startup;
-    PROCESS_INFORMATION process;
-    if (!CreateProcessA(program.c_str(), &command[0], NULL, NULL, FALSE, 0, NULL, NULL, &startup, &process))
-        return (DWORD)-1;
-    WaitForSingleObject(process.hProcess, 20000);
-    DWORD code = (DWORD)-1;
-    GetExitCodeProcess(process.hProcess, &code);
-    CloseHandle(process.hProcess);
-    CloseHandle(process.hThread);
-    return code;
-}
-
-TEST(Gatectl, AnswersTheMemoryQueryToTheNamedWindow)
-{
-    WNDCLASSA type = {};
-    type.lpfnWndProc = DefWindowProcA;
-    type.hInstance = GetModuleHandleA(NULL);
-    type.lpszClassName = "CompanionsGateReply";
-    RegisterClassA(&type);
-    HWND window = CreateWindowExA(0, type.lpszClassName, "", 0, 0, 0, 1, 1, NULL, NULL, type.hInstance, NULL);
-    ASSERT_TRUE(window != NULL);
-
-    EXPECT_EQ(0u, RunGatectl("3 CompanionsGateReply"));
-    MSG reply;
-    ASSERT_TRUE(PeekMessageA(&reply, window, MSG_GATE_REPLY, MSG_GATE_REPLY, PM_REMOVE));
-    uint32_t size = (uint32_t)reply.lParam;
-    EXPECT_EQ(PackMemorySize(MeasureVideoMemory()), size);
-    if (size == 0) {
-        printf("DirectDraw reports no video memory here: the answer is 0\n");
-    } else {
-        EXPECT_GE(size >> 16, 1u);
-        EXPECT_LE(size >> 16, 4096u);
-        EXPECT_EQ(0u, (size & 0xFFFF) % 64);
-        EXPECT_LT(size & 0xFFFF, 1024u);
+class GateCompanion : public testing::Test {
+protected:
+    void SetUp() override
+    {
+        SetEnvironmentVariableA("FAKE_GATECTL_REPLY", NULL);
+        restart = {0, 0, 1, false, TRUE};
+        ForgetGateMemorySize();
+        main = CreatePowerWindow(main_window_class);
+        ASSERT_TRUE(CopyFileA((TestFolder() + "fake-gatectl.exe").c_str(), companion.c_str(), FALSE));
+    }
+    void TearDown() override
+    {
+        gate_reply_timeout = GATE_REPLY_TIMEOUT_MS;
+        ForgetGateMemorySize();
+        DestroyPowerWindow(main);
+        DeleteFileA(companion.c_str());
+    }
+    // The command line of the stand-in's next start, once it has done its work and ended.
+    std::string NextStart()
+    {
+        MSG m;
+        DWORD start = GetTickCount();
+        while (!PeekMessageA(&m, main, WM_APP, WM_APP, PM_REMOVE)) {
+            if (GetTickCount() - start > 10000) return "(no start)";
+            MsgWaitForMultipleObjects(0, NULL, FALSE, 100, QS_POSTMESSAGE);
+        }
+        char line[256] = "";
+        GlobalGetAtomNameA((ATOM)m.lParam, line, sizeof line);
+        GlobalDeleteAtom((ATOM)m.lParam);
+        HANDLE process = OpenProcess(SYNCHRONIZE, FALSE, (DWORD)m.wParam);
+        WaitForSingleObject(process, 10000);
+        CloseHandle(process);
+        return line;
     }
 
-    EXPECT_EQ(1u, RunGatectl("3 NoSuchCompanionsWindow"));
-    EXPECT_FALSE(PeekMessageA(&reply, window, MSG_GATE_REPLY, MSG_GATE_REPLY, PM_REMOVE));
-    DestroyWindow(window);
+    std::string companion = TestFolder() + "gatectl.exe";
+    HWND main = NULL;
+};
+
+TEST_F(GateCompanion, RestartGoesThroughTheCompanionElseStraightToWindows)
+{
+    EXPECT_EQ(1, GateRestart());
+    EXPECT_EQ("gatectl.exe 2 restart", NextStart());
+    EXPECT_EQ(0, restart.calls);
+    ASSERT_TRUE(DeleteFileA(companion.c_str()));
+    for (BOOL answer : {TRUE, FALSE}) {
+        restart.answer = answer;
+        EXPECT_EQ(answer, GateRestart());
+    }
+    EXPECT_TRUE(restart.calls == 2 && restart.flags == EWX_REBOOT && restart.reason == 0);
+}
+
+// The wait takes the answer and leaves every other message where it was.
+TEST_F(GateCompanion, MemorySizeIsAskedUntilAnsweredThenKept)
+{
+    gate_reply_timeout = 300;
+    DWORD start = GetTickCount();
+    EXPECT_EQ(0u, GateMemorySize()) << "a silent companion";
+    EXPECT_GE(GetTickCount() - start, 300u);
+    EXPECT_EQ("gatectl.exe 3 zentra", NextStart());
+
+    gate_reply_timeout = GATE_REPLY_TIMEOUT_MS;
+    SetEnvironmentVariableA("FAKE_GATECTL_REPLY", "0x40000");
+    PostMessageA(main, WM_USER + 5, 0, 0);
+    EXPECT_EQ(0x40000u, GateMemorySize());
+    MSG message;
+    EXPECT_TRUE(PeekMessageA(&message, main, WM_USER + 5, WM_USER + 5, PM_REMOVE));
+    EXPECT_EQ("gatectl.exe 3 zentra", NextStart());
+
+    ASSERT_TRUE(DeleteFileA(companion.c_str()));
+    EXPECT_EQ(0x40000u, GateMemorySize()) << "kept";
+    ForgetGateMemorySize();
+    start = GetTickCount();
+    EXPECT_EQ(0u, GateMemorySize()) << "no companion";
+    EXPECT_LT(GetTickCount() - start, GATE_REPLY_TIMEOUT_MS / 2u) << "no wait for what did not start";
+}
+
+// The real gatectl.exe measures and answers the window it is named.
+TEST_F(GateCompanion, RealCompanionAnswersTheNamedWindow)
+{
+    uint32_t size = PackMemorySize(MeasureVideoMemory());
+    EXPECT_GE(size >> 16, 1u) << "DirectDraw knows the card's megabytes";
+    for (std::string to : {"zentra", "NoSuchCompanionsWindow"}) {
+        ChildProcess gatectl;
+        ASSERT_TRUE(gatectl.Start("\"" + SimBuildFolder() + "gatectl.exe\" 3 " + to));
+        EXPECT_EQ(to == "zentra" ? 0 : 1, gatectl.WaitExit(20000)) << to;
+        MSG reply;
+        EXPECT_EQ(to == "zentra", PeekMessageA(&reply, main, MSG_GATE_REPLY, MSG_GATE_REPLY, PM_REMOVE)) << to;
+        if (to == "zentra") EXPECT_EQ(size, (uint32_t)reply.lParam);
+    }
 }
 
 }  // namespace

@@ -1,86 +1,55 @@
 #include "power_window.h"
 
-#include "shell/main_window.h"
+#include "base/protocol.h"
 
-static const char power_window_class[] = "CompanionsPowerWindow";
-
-HWND CreatePowerWindow()
+HWND CreatePowerWindow(const char* class_name)
 {
-    WNDCLASSA type = {};
-    type.lpfnWndProc = DefWindowProcA;
-    type.hInstance = GetModuleHandleA(NULL);
-    type.lpszClassName = power_window_class;
+    WNDCLASSA type = {0, DefWindowProcA, 0, 0, GetModuleHandleA(NULL), NULL, NULL, NULL, NULL, class_name};
     RegisterClassA(&type);
-    HWND window = CreateWindowExA(0, power_window_class, "power", WS_OVERLAPPEDWINDOW, 10, 10, 200, 100, NULL, NULL,
-                                  type.hInstance, NULL);
-    return window;
+    return CreateWindowExA(0, class_name, "", WS_POPUP | WS_VISIBLE, 10, 10, 99, 99, NULL, NULL, type.hInstance, NULL);
 }
 
 void DestroyPowerWindow(HWND window)
 {
     DestroyWindow(window);
-    // Nothing posted to the old window may leak into the next test.
-    MSG message;
-    while (PeekMessageA(&message, NULL, 0, 0, PM_REMOVE)) DispatchMessageA(&message);
+    for (MSG message; PeekMessageA(&message, NULL, 0, 0, PM_REMOVE);) DispatchMessageA(&message);
 }
 
-std::vector<PowerPost> CollectPowerPosts(HWND window, size_t count, DWORD timeout_ms)
-{
-    std::vector<PowerPost> posts;
-    DWORD start = GetTickCount();
-    while (posts.size() < count) {
-        MSG message;
-        while (posts.size() < count && PeekMessageA(&message, NULL, 0, 0, PM_REMOVE)) {
-            if (message.hwnd == window && message.message == MSG_POWER_STATE)
-                posts.push_back({(int)message.wParam, GetTickCount()});
-            else {
-                TranslateMessage(&message);
-                DispatchMessageA(&message);
-            }
-        }
-        DWORD spent = GetTickCount() - start;
-        if (posts.size() >= count || spent >= timeout_ms) break;
-        MsgWaitForMultipleObjects(0, NULL, FALSE, timeout_ms - spent, QS_ALLINPUT);
-    }
-    return posts;
-}
-
-std::vector<int> States(const std::vector<PowerPost>& posts)
+std::vector<int> CollectPowerPosts(HWND window, size_t count, DWORD timeout_ms, std::vector<DWORD>* at)
 {
     std::vector<int> states;
-    for (const PowerPost& post : posts) states.push_back(post.state);
+    DWORD start = GetTickCount();
+    for (MSG message; states.size() < count;) {
+        if (!PeekMessageA(&message, NULL, 0, 0, PM_REMOVE)) {
+            DWORD spent = GetTickCount() - start;
+            if (spent >= timeout_ms) break;
+            MsgWaitForMultipleObjects(0, NULL, FALSE, timeout_ms - spent, QS_ALLINPUT);
+        } else if (message.hwnd != window || message.message != MSG_POWER_STATE) {
+            DispatchMessageA(&message);
+        } else {
+            states.push_back((int)message.wParam);
+            if (at) at->push_back(GetTickCount());
+        }
+    }
     return states;
 }
 
-DWORD MinuteLengthFor(DWORD ms) { return (ms * 65536 + 59999) / 60000; }
-
 void PressShift()
 {
-    INPUT keys[2] = {};
-    keys[0].type = INPUT_KEYBOARD;
-    keys[0].ki.wVk = VK_SHIFT;
-    keys[1] = keys[0];
-    keys[1].ki.dwFlags = KEYEVENTF_KEYUP;
+    INPUT keys[2] = {{INPUT_KEYBOARD, {.ki = {VK_SHIFT, 0, 0, 0, 0}}},
+                     {INPUT_KEYBOARD, {.ki = {VK_SHIFT, 0, KEYEVENTF_KEYUP, 0, 0}}}};
     SendInput(2, keys, sizeof(INPUT));
 }
 
 void NudgeMouse()
 {
-    // Away from the nearer screen edge, where a move would be clamped to nothing.
-    POINT at = {0, 0};
-    GetCursorPos(&at);
-    INPUT move = {};
-    move.type = INPUT_MOUSE;
-    move.mi.dx = at.x > 100 ? -7 : 7;
-    move.mi.dy = at.y > 100 ? -5 : 5;
-    move.mi.dwFlags = MOUSEEVENTF_MOVE;
+    INPUT move = {INPUT_MOUSE, {.mi = {-7, -5, 0, MOUSEEVENTF_MOVE, 0, 0}}};
     SendInput(1, &move, sizeof(INPUT));
 }
 
 std::string TestFolder()
 {
     char path[MAX_PATH];
-    DWORD length = GetModuleFileNameA(NULL, path, sizeof path);
-    std::string folder(path, length);
+    std::string folder(path, GetModuleFileNameA(NULL, path, sizeof path));
     return folder.substr(0, folder.find_last_of('\\') + 1);
 }

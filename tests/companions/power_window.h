@@ -1,5 +1,4 @@
-// A window of the test thread that takes MSG_POWER_STATE the way the main
-// window does, and a record of what arrived when.
+// What the companion tests share: a window that takes MSG_POWER_STATE, input.
 #ifndef VISTREL_TEST_POWER_WINDOW_H
 #define VISTREL_TEST_POWER_WINDOW_H
 
@@ -8,27 +7,18 @@
 #include <string>
 #include <vector>
 
-struct PowerPost {
-    int state;
-    DWORD at;  // GetTickCount when it was taken from the queue
-};
+// The timer minute the tests give the hook library: about 20 ms.
+enum { UNIT_MS = 20, UNIT_MINUTE = (UNIT_MS * 65536 + 59999) / 60000, LATE_MS = 3000 };
 
-HWND CreatePowerWindow();
-void DestroyPowerWindow(HWND window);
-
+HWND CreatePowerWindow(const char* class_name = "CompanionsPowerWindow");
+void DestroyPowerWindow(HWND window);  // and what was posted, so that nothing leaks into the next test
 // Dispatches this thread's messages until `count` MSG_POWER_STATE posts to
-// window have arrived or timeout_ms have passed; returns those that came.
-std::vector<PowerPost> CollectPowerPosts(HWND window, size_t count, DWORD timeout_ms);
-std::vector<int> States(const std::vector<PowerPost>& posts);
+// window have come or timeout_ms have passed: their states, and in *at the
+// GetTickCount of each.
+std::vector<int> CollectPowerPosts(HWND window, size_t count, DWORD timeout_ms, std::vector<DWORD>* at = nullptr);
 
-// The start call's minute length for a timer minute of about `ms` milliseconds.
-DWORD MinuteLengthFor(DWORD ms);
-
-// Input as a user would make it: SendInput, taken by the system's input queue.
-void PressShift();
-void NudgeMouse();
-
-// Folder of the test program, with its trailing backslash.
-std::string TestFolder();
+void PressShift();  // through the system's input queue
+void NudgeMouse();  // up and to the left
+std::string TestFolder();  // with its trailing backslash
 
 #endif

@@ -1,33 +1,14 @@
-// Stands in for gatectl.exe beside the test program: notes how it was
-// started and, when told to, answers a memory query with a given size.
-//   FAKE_GATECTL_LOG    file that gets "<process id> <command line>"
-//   FAKE_GATECTL_REPLY  the size to post to the window named after "3"
-//   FAKE_GATECTL_DONE   semaphore released once all that is done
+// Stands in for gatectl.exe: posts, for "3", the size in FAKE_GATECTL_REPLY as the answer, then
+// WM_APP with its process id and its command line (a global atom) to the program's window.
 #include <windows.h>
-#include <stdio.h>
 #include <stdlib.h>
 
 int WINAPI WinMain(HINSTANCE inst, HINSTANCE previous, LPSTR arguments, int show)
 {
-    char value[MAX_PATH];
-    if (GetEnvironmentVariableA("FAKE_GATECTL_LOG", value, sizeof value)) {
-        FILE* log = fopen(value, "a");
-        if (log) {
-            fprintf(log, "%lu %s\n", GetCurrentProcessId(), GetCommandLineA());
-            fclose(log);
-        }
-    }
-    if (arguments[0] == '3' && arguments[1] == ' ' &&
-        GetEnvironmentVariableA("FAKE_GATECTL_REPLY", value, sizeof value)) {
-        HWND window = FindWindowA(arguments + 2, NULL);
-        if (window) PostMessageA(window, 1228, 0, (LPARAM)strtoul(value, NULL, 0));
-    }
-    if (GetEnvironmentVariableA("FAKE_GATECTL_DONE", value, sizeof value)) {
-        HANDLE done = OpenSemaphoreA(SEMAPHORE_MODIFY_STATE, FALSE, value);
-        if (done) {
-            ReleaseSemaphore(done, 1, NULL);
-            CloseHandle(done);
-        }
-    }
+    HWND window = FindWindowA("zentra", NULL);
+    char size[32];
+    if (arguments[0] == '3' && GetEnvironmentVariableA("FAKE_GATECTL_REPLY", size, sizeof size))
+        PostMessageA(window, 1228, 0, (LPARAM)strtoul(size, NULL, 0));
+    PostMessageA(window, WM_APP, GetCurrentProcessId(), GlobalAddAtomA(GetCommandLineA()));
     return 0;
 }
