@@ -1,13 +1,9 @@
 #include "support/machine.h"
 
-#include <string.h>
+#include <gtest/gtest.h>
 
-#include "base/adapters.h"
 #include "base/state.h"
-#include "hardware/driver_key.h"
 #include "modes/detect.h"
-#include "modes/mode_keys.h"
-#include "modes/rate_list.h"
 #include "support/support.h"
 
 SimCardConfig Card(uint16_t vendor_id, uint16_t device_id, uint8_t bus, uint8_t device)
@@ -33,27 +29,16 @@ void BootMachine(const SimMachineConfig& config)
 {
     SimBoot(&config);
     ResetProgramState();
-    switch (config.windows) {
-    case SIM_WINDOWS_95:
-        platform = PLATFORM_9X;
-        os_class = 3;
-        break;
-    case SIM_WINDOWS_98:
-        platform = PLATFORM_9X;
-        os_class = OS_CLASS_WIN98;
-        break;
-    default:
-        platform = PLATFORM_NT;
-        os_class = 3;
-        break;
-    }
+    platform = config.windows == SIM_WINDOWS_NT4 ? PLATFORM_NT : PLATFORM_9X;
+    os_class = config.windows == SIM_WINDOWS_98 ? OS_CLASS_WIN98 : 3;
 }
 
-void BootDefaultAndDetect()
+void BootDefaultAndDetect(int windows)
 {
     SimMachineConfig config;
     SimDefaultMachine(&config);
+    config.windows = windows;
     BootMachine(config);
-    DetectAdapters();
+    ASSERT_EQ(1, DetectAdapters()) << "Windows " << windows;
     RefreshAdapterModes(REFRESH_AT_STARTUP);
 }
