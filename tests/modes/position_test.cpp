@@ -12,35 +12,33 @@ static const char card_key[] = "SOFTWARE\\QUORVEL\\PANEL\\53338901";
 
 static uint8_t Crtc(uint16_t index) { return SimReadRegister(0, SIM_REG_CRTC, index); }
 static void SetCrtc(uint16_t index, uint8_t value) { SimWriteRegister(0, SIM_REG_CRTC, index, value); }
-
-// Read from the bits the VGA documents, not through the program's fields.
+// From the bits the VGA documents, not through the program's fields.
 static unsigned VerticalRetrace() { return Crtc(0x10) | (Crtc(0x07) & 0x04) << 6 | (Crtc(0x07) & 0x80) << 2; }
 
-static bool Stored(const char* name, int* value)
+// The stored value of the test mode, -1 when there is none.
+static int Stored(char axis)
 {
     bool found = false;
-    *value = atoi(ReadRegistryRaw(HKEY_LOCAL_MACHINE, card_key, name, &found).c_str());
-    return found;
+    std::string name = std::string("1024x768x16x75") + axis;
+    int value = atoi(ReadRegistryRaw(HKEY_LOCAL_MACHINE, card_key, name, &found).c_str());
+    return found ? value : -1;
 }
 
-// Horizontal blank start 0x80; CR07 keeps its other bits set so that a step
-// disturbing them shows; CR11 locked.
+// Horizontal blank start 0x80; CR07's other bits set, so that a step that
+// disturbs them shows; CR11 locked.
 static void SetCrt(uint8_t hretrace, unsigned vblank, unsigned vretrace)
 {
-    const uint8_t values[][2] = {
-        {0x02, 0x80},
-        {0x04, hretrace},
-        {0x07, (uint8_t)(0x33 | (vretrace & 0x100) >> 6 | (vblank & 0x100) >> 5 | (vretrace & 0x200) >> 2)},
-        {0x09, (uint8_t)(0x40 | (vblank & 0x200) >> 4)},
-        {0x10, (uint8_t)vretrace},
-        {0x15, (uint8_t)vblank},
-        {0x11, 0x85}};
-    for (const auto& v : values) SetCrtc(v[0], v[1]);
+    const uint8_t crt[][2] = {{0x02, 0x80},
+                              {0x04, hretrace},
+                              {0x07, (uint8_t)(0x33 | (vretrace & 0x100) >> 6 | (vblank & 0x100) >> 5 | (vretrace & 0x200) >> 2)},
+                              {0x09, (uint8_t)(0x40 | (vblank & 0x200) >> 4)},
+                              {0x10, (uint8_t)vretrace},
+                              {0x15, (uint8_t)vblank},
+                              {0x11, 0x85}};
+    for (const auto& r : crt) SetCrtc(r[0], r[1]);
 }
-// Blank start 768 needs CR07 bit 3 and CR09 bit 5.
-static void SetUsualCrt() { SetCrt(0x84, 768, 771); }
-// Room for 21 steps each way; a step up from 0x1FF carries into bit 9.
-static void SetRoomyCrt() { SetCrt(0x98, 0x1E0, 0x1FF); }
+static void SetUsualCrt() { SetCrt(0x84, 768, 771); }    // blank start 768: CR07 bit 3 and CR09 bit 5
+static void SetRoomyCrt() { SetCrt(0x98, 0x1E0, 0x1FF); }  // 21 steps each way; up from 0x1FF sets bit 9
 
 class Position : public ::testing::Test {
 protected:
@@ -55,9 +53,8 @@ protected:
     void TearDown() override { DeleteRegistryTree(HKEY_LOCAL_MACHINE, card_key); }
 };
 
-TEST_F(Position, RetraceStepsStopAtTheBlankStartAndTheRegistersEnd)
+TEST_F(Position, StepsStopAtTheBlankStartTheRegistersEndAndTheLimit)
 {
-    EXPECT_EQ(-1, SteppedRetraceStart(0, 0, -1, 0x3FF)) << "wrapped below 0";
     EXPECT_EQ(4, StepPicture(STEP_RIGHT, 10));
     EXPECT_EQ(0x80, Crtc(0x04));
     EXPECT_EQ(0x85, Crtc(0x11)) << "CR11 locked again";
@@ -65,27 +62,21 @@ TEST_F(Position, RetraceStepsStopAtTheBlankStartAndTheRegistersEnd)
     EXPECT_EQ(2, StepPicture(STEP_LEFT, 5));
     EXPECT_EQ(0xFF, Crtc(0x04));
     EXPECT_EQ(0x80, Crtc(0x02));
-
-    SetRoomyCrt();
-    EXPECT_EQ(1, StepPicture(STEP_UP, 1));
-    EXPECT_EQ(0x200u, VerticalRetrace());
-    EXPECT_EQ(0x3B, Crtc(0x07) & 0x7B) << "only the retrace bits of CR07 change";
-    SetUsualCrt();
     EXPECT_EQ(3, StepPicture(STEP_DOWN, 21));
     EXPECT_EQ(768u, VerticalRetrace());
-    EXPECT_EQ(0x85, Crtc(0x11));
     // Blank start 0xFF under retrace 0x100: each takes bit 8 from its own CR07 bit.
     const uint8_t crt[][2] = {{0x15, 0xFF}, {0x09, 0x40}, {0x07, 0x37}, {0x10, 0x00}};
-    for (const auto& v : crt) SetCrtc(v[0], v[1]);
+    for (const auto& r : crt) SetCrtc(r[0], r[1]);
     EXPECT_EQ(1, StepPicture(STEP_DOWN, 3));
     EXPECT_EQ(0xFFu, VerticalRetrace());
-}
+    EXPECT_EQ(-1, SteppedRetraceStart(0, 0, -1, 0x3FF)) << "wrapped below 0";
 
-TEST_F(Position, StepsWithinTheLimitAndTheirUndo)
-{
     SetRoomyCrt();
     int h = 0, v = 0;
-    for (int i = 0; i < 3; ++i) EXPECT_EQ(STEP_TAKEN, StepWithinLimit(STEP_DOWN, &h, &v));
+    EXPECT_EQ(STEP_TAKEN, StepWithinLimit(STEP_UP, &h, &v));
+    EXPECT_EQ(0x200u, VerticalRetrace());
+    EXPECT_EQ(0x3B, Crtc(0x07) & 0x7B) << "only the retrace bits of CR07 change";
+    for (int i = 0; i < 4; ++i) StepWithinLimit(STEP_DOWN, &h, &v);
     for (int i = 0; i < 2; ++i) StepWithinLimit(STEP_LEFT, &h, &v);
     ASSERT_EQ(2, h);
     ASSERT_EQ(-3, v);
@@ -105,18 +96,15 @@ TEST_F(Position, StepsWithinTheLimitAndTheirUndo)
 
 TEST_F(Position, SavedRegistersComeBackInTheirModeOnly)
 {
-    int value = 0;
     SavePosition(0, 0);
-    EXPECT_FALSE(Stored("1024x768x16x75H", &value));
+    EXPECT_EQ(-1, Stored('H'));
     StepPicture(STEP_RIGHT, 1);
     SavePosition(-1, 0);
-    ASSERT_TRUE(Stored("1024x768x16x75H", &value));
-    EXPECT_EQ(0x83, value);
-    EXPECT_FALSE(Stored("1024x768x16x75V", &value));
+    EXPECT_EQ(0x83, Stored('H'));
+    EXPECT_EQ(-1, Stored('V'));
     StepPicture(STEP_UP, 4);
     SavePosition(0, 4);
-    ASSERT_TRUE(Stored("1024x768x16x75V", &value));
-    EXPECT_EQ(Crtc(0x10) + 256 * Crtc(0x07), value);
+    EXPECT_EQ(Crtc(0x10) + 256 * Crtc(0x07), Stored('V'));
 
     SetUsualCrt();  // a mode change programs the timing afresh
     adapter_table[0].refresh_hz = 60;
@@ -127,19 +115,15 @@ TEST_F(Position, SavedRegistersComeBackInTheirModeOnly)
     EXPECT_EQ(0x83, Crtc(0x04));
     EXPECT_EQ(771u + 4, VerticalRetrace());
     EXPECT_EQ(0x85, Crtc(0x11));
-}
 
-TEST_F(Position, RestoringVTakesOnlyTheRetraceBitsOfTheStoredOverflow)
-{
+    // Of a stored overflow byte only the retrace bits are the position's.
     SaveSetting(SETTING_POSITION_V, 0x05 + 256 * 0x93);  // retrace 0x205
+    SaveSetting(SETTING_POSITION_H, 256);                // out of range
     SetCrtc(0x07, 0x64);
     RestorePosition();
     EXPECT_EQ(0x05, Crtc(0x10));
     EXPECT_EQ(0xE0, Crtc(0x07));
-    EXPECT_EQ(0x84, Crtc(0x04));
-    SaveSetting(SETTING_POSITION_H, 256);  // out of range
-    RestorePosition();
-    EXPECT_EQ(0x84, Crtc(0x04));
+    EXPECT_EQ(0x83, Crtc(0x04));
 }
 
 TEST_F(Position, NoRegisterAccessWithNothingStoredAdjustmentOffOrNoDevice)
@@ -153,18 +137,17 @@ TEST_F(Position, NoRegisterAccessWithNothingStoredAdjustmentOffOrNoDevice)
     EXPECT_EQ(0u, SimGetCounters()->port_reads + SimGetCounters()->port_writes);
     EXPECT_EQ(0x84, Crtc(0x04));
 
-    // NT without the kernel device: registers that cannot be read must
-    // neither move nor replace a stored position.
+    // NT without the kernel device: registers that cannot be read neither
+    // move nor replace a stored position.
     SimMachineConfig config = Machine(SIM_WINDOWS_NT4, {Card(0x5333, 0x8901)});
     config.nt_device = false;
     SimBoot(&config);
     platform = PLATFORM_NT;
     adapter_table[0].flags = 0;
     SaveSetting(SETTING_POSITION_H, 0x90);
-    int h = 0, v = 0, value = 0;
+    int h = 0, v = 0;
     EXPECT_EQ(STEP_REFUSED, StepWithinLimit(STEP_UP, &h, &v));
     EXPECT_EQ(0, v);
     SavePosition(1, 0);
-    EXPECT_TRUE(Stored("1024x768x16x75H", &value));
-    EXPECT_EQ(0x90, value);
+    EXPECT_EQ(0x90, Stored('H'));
 }
