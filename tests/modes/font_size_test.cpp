@@ -7,7 +7,9 @@
 #include "modes/font_size.h"
 #include "support/support.h"
 
-extern "C" LONG WINAPI RegDeleteKeyValueA(HKEY key, LPCSTR subkey, LPCSTR name);  // declared for Vista and later
+// Declared for Vista and later only.
+extern "C" LONG WINAPI RegDeleteKeyValueA(HKEY key, LPCSTR subkey, LPCSTR name);
+extern "C" LONG WINAPI RegSetKeyValueA(HKEY key, LPCSTR subkey, LPCSTR name, DWORD type, LPCVOID data, DWORD size);
 
 typedef std::map<std::string, std::string> Values;
 static const char fontsize[] = "SOFTWARE\\Microsoft\\Windows\\CurrentVersion\\fontsize\\";
@@ -52,11 +54,9 @@ TEST(FontSizeOn9x, TheSetFollowsTheDpiWhichIsRecorded)
               Read(HKEY_CURRENT_CONFIG, "Display\\Fonts"));
 
     SwitchFontSize(108, 100);  // 108 is still small
-    Values s = Read(HKEY_CURRENT_CONFIG, "Display\\Settings");
-    EXPECT_EQ("vgasys.fon", s["fonts.fon"]);
-    EXPECT_EQ("108", s["DPIPhysicalX"]);
-    EXPECT_EQ("100", s["DPIPhysicalY"]);
-    EXPECT_EQ("100", s["DPILogicalY"]);
+    EXPECT_EQ((Values{{"fonts.fon", "vgasys.fon"}, {"fixedfon.fon", "8514fix.fon"}, {"DPIPhysicalX", "108"},
+                      {"DPIPhysicalY", "100"}, {"DPILogicalY", "100"}, {"Resolution", "1024,768"}}),
+              Read(HKEY_CURRENT_CONFIG, "Display\\Settings"));
     EXPECT_EQ((Values{{"MS Sans Serif 8,10,12,14,18,24", "sserife.fon"}}), Read(HKEY_CURRENT_CONFIG, "Display\\Fonts"));
 
     // Without the set's font list the current one stays.
@@ -111,13 +111,10 @@ TEST(FontSizeOnNT, SystemFontsAndRegistrationsSwapBothWays)
     EXPECT_EQ(before, Read(HKEY_CURRENT_CONFIG, nt_fonts));
     EXPECT_EQ(0, Registered("(8514a res)"));
 
-    HKEY key;
-    RegOpenKeyExA(HKEY_CURRENT_CONFIG, nt_fonts, 0, KEY_ALL_ACCESS, &key);
     for (const Saved& v : saved) {
-        if (v.found) RegSetValueExA(key, v.name, 0, v.type, (const BYTE*)v.data.data(), (DWORD)v.data.size());
-        else RegDeleteValueA(key, v.name);
+        if (v.found) RegSetKeyValueA(HKEY_CURRENT_CONFIG, nt_fonts, v.name, v.type, &v.data[0], (DWORD)v.data.size());
+        else RegDeleteKeyValueA(HKEY_CURRENT_CONFIG, nt_fonts, v.name);
     }
-    RegCloseKey(key);
     for (const auto& kv : Read(HKEY_LOCAL_MACHINE, registrations))
         if (kv.first.find(" res)") != std::string::npos)
             RegDeleteKeyValueA(HKEY_LOCAL_MACHINE, registrations, kv.first.c_str());

@@ -8,37 +8,21 @@
 #include "support/machine.h"
 #include "support/support.h"
 
-static const char card_key[] = "SOFTWARE\\QUORVEL\\PANEL\\53338901";
-
 static uint8_t Crtc(uint16_t index) { return SimReadRegister(0, SIM_REG_CRTC, index); }
 static void SetCrtc(uint16_t index, uint8_t value) { SimWriteRegister(0, SIM_REG_CRTC, index, value); }
 // From the bits the VGA documents, not through the program's fields.
 static unsigned VerticalRetrace() { return Crtc(0x10) | (Crtc(0x07) & 0x04) << 6 | (Crtc(0x07) & 0x80) << 2; }
 
-// The stored value of the test mode, -1 when there is none.
-static int Stored(char axis)
-{
-    bool found = false;
-    std::string name = std::string("1024x768x16x75") + axis;
-    int value = atoi(ReadRegistryRaw(HKEY_LOCAL_MACHINE, card_key, name, &found).c_str());
-    return found ? value : -1;
-}
-
 // Horizontal blank start 0x80; CR07's other bits set, so that a step that
 // disturbs them shows; CR11 locked.
 static void SetCrt(uint8_t hretrace, unsigned vblank, unsigned vretrace)
 {
-    const uint8_t crt[][2] = {{0x02, 0x80},
-                              {0x04, hretrace},
-                              {0x07, (uint8_t)(0x33 | (vretrace & 0x100) >> 6 | (vblank & 0x100) >> 5 | (vretrace & 0x200) >> 2)},
-                              {0x09, (uint8_t)(0x40 | (vblank & 0x200) >> 4)},
-                              {0x10, (uint8_t)vretrace},
-                              {0x15, (uint8_t)vblank},
-                              {0x11, 0x85}};
+    uint8_t cr07 = (uint8_t)(0x33 | (vretrace & 0x100) >> 6 | (vblank & 0x100) >> 5 | (vretrace & 0x200) >> 2);
+    uint8_t cr09 = (uint8_t)(0x40 | (vblank & 0x200) >> 4);
+    const uint8_t crt[][2] = {{0x02, 0x80},           {0x04, hretrace},      {0x07, cr07}, {0x09, cr09},
+                              {0x10, (uint8_t)vretrace}, {0x15, (uint8_t)vblank}, {0x11, 0x85}};
     for (const auto& r : crt) SetCrtc(r[0], r[1]);
 }
-static void SetUsualCrt() { SetCrt(0x84, 768, 771); }    // blank start 768: CR07 bit 3 and CR09 bit 5
-static void SetRoomyCrt() { SetCrt(0x98, 0x1E0, 0x1FF); }  // 21 steps each way; up from 0x1FF sets bit 9
 
 class Position : public ::testing::Test {
 protected:
@@ -47,10 +31,10 @@ protected:
         BootMachine(Machine(SIM_WINDOWS_98, {Card(0x5333, 0x8901)}));
         adapter_count = 1;
         adapter_table[0] = AdapterRecord{0x5333, 0x8901, 0, 10 << 3, 16, 1024, 768, 75, 15};
-        DeleteRegistryTree(HKEY_LOCAL_MACHINE, card_key);
-        SetUsualCrt();
+        ClearSettingsStore();
+        SetCrt(0x84, 768, 771);  // blank start 768: CR07 bit 3 and CR09 bit 5
     }
-    void TearDown() override { DeleteRegistryTree(HKEY_LOCAL_MACHINE, card_key); }
+    void TearDown() override { ClearSettingsStore(); }
 };
 
 TEST_F(Position, StepsStopAtTheBlankStartTheRegistersEndAndTheLimit)
@@ -71,7 +55,7 @@ TEST_F(Position, StepsStopAtTheBlankStartTheRegistersEndAndTheLimit)
     EXPECT_EQ(0xFFu, VerticalRetrace());
     EXPECT_EQ(-1, SteppedRetraceStart(0, 0, -1, 0x3FF)) << "wrapped below 0";
 
-    SetRoomyCrt();
+    SetCrt(0x98, 0x1E0, 0x1FF);  // 21 steps each way; up from 0x1FF sets bit 9
     int h = 0, v = 0;
     EXPECT_EQ(STEP_TAKEN, StepWithinLimit(STEP_UP, &h, &v));
     EXPECT_EQ(0x200u, VerticalRetrace());
@@ -94,19 +78,24 @@ TEST_F(Position, StepsStopAtTheBlankStartTheRegistersEndAndTheLimit)
     EXPECT_EQ(-OFFSET_LIMIT, v);
 }
 
+// Only the retrace bits of a stored overflow byte are the position's; with
+// nothing stored, adjustment off or no register access nothing moves.
 TEST_F(Position, SavedRegistersComeBackInTheirModeOnly)
 {
+    SimResetCounters();
+    RestorePosition();
     SavePosition(0, 0);
-    EXPECT_EQ(-1, Stored('H'));
+    EXPECT_EQ(0u, SimGetCounters()->port_reads + SimGetCounters()->port_writes);
+    EXPECT_EQ(-1, LoadSetting(SETTING_POSITION_H));
     StepPicture(STEP_RIGHT, 1);
     SavePosition(-1, 0);
-    EXPECT_EQ(0x83, Stored('H'));
-    EXPECT_EQ(-1, Stored('V'));
+    EXPECT_EQ(0x83, LoadSetting(SETTING_POSITION_H));
+    EXPECT_EQ(-1, LoadSetting(SETTING_POSITION_V));
     StepPicture(STEP_UP, 4);
     SavePosition(0, 4);
-    EXPECT_EQ(Crtc(0x10) + 256 * Crtc(0x07), Stored('V'));
+    EXPECT_EQ(Crtc(0x10) + 256 * Crtc(0x07), LoadSetting(SETTING_POSITION_V));
 
-    SetUsualCrt();  // a mode change programs the timing afresh
+    SetCrt(0x84, 768, 771);  // a mode change programs the timing afresh
     adapter_table[0].refresh_hz = 60;
     RestorePosition();
     EXPECT_EQ(0x84, Crtc(0x04)) << "nothing stored for 60 Hz";
@@ -115,8 +104,6 @@ TEST_F(Position, SavedRegistersComeBackInTheirModeOnly)
     EXPECT_EQ(0x83, Crtc(0x04));
     EXPECT_EQ(771u + 4, VerticalRetrace());
     EXPECT_EQ(0x85, Crtc(0x11));
-
-    // Of a stored overflow byte only the retrace bits are the position's.
     SaveSetting(SETTING_POSITION_V, 0x05 + 256 * 0x93);  // retrace 0x205
     SaveSetting(SETTING_POSITION_H, 256);                // out of range
     SetCrtc(0x07, 0x64);
@@ -124,19 +111,13 @@ TEST_F(Position, SavedRegistersComeBackInTheirModeOnly)
     EXPECT_EQ(0x05, Crtc(0x10));
     EXPECT_EQ(0xE0, Crtc(0x07));
     EXPECT_EQ(0x83, Crtc(0x04));
-}
 
-TEST_F(Position, NoRegisterAccessWithNothingStoredAdjustmentOffOrNoDevice)
-{
-    SimResetCounters();
-    RestorePosition();
     SaveSetting(SETTING_POSITION_H, 0x90);
     adapter_table[0].flags |= ADAPTER_NO_ADJUST;
+    SimResetCounters();
     RestorePosition();
     EXPECT_EQ(0, StepPicture(STEP_LEFT, 1));
     EXPECT_EQ(0u, SimGetCounters()->port_reads + SimGetCounters()->port_writes);
-    EXPECT_EQ(0x84, Crtc(0x04));
-
     // NT without the kernel device: registers that cannot be read neither
     // move nor replace a stored position.
     SimMachineConfig config = Machine(SIM_WINDOWS_NT4, {Card(0x5333, 0x8901)});
@@ -149,5 +130,5 @@ TEST_F(Position, NoRegisterAccessWithNothingStoredAdjustmentOffOrNoDevice)
     EXPECT_EQ(STEP_REFUSED, StepWithinLimit(STEP_UP, &h, &v));
     EXPECT_EQ(0, v);
     SavePosition(1, 0);
-    EXPECT_EQ(0x90, Stored('H'));
+    EXPECT_EQ(0x90, LoadSetting(SETTING_POSITION_H));
 }

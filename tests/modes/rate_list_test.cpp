@@ -26,58 +26,36 @@ TEST(RateList, ItemsCountsAndInsertion)
     EXPECT_EQ((std::vector<uint16_t>{56, 60, 72, 75, 85}), std::vector<uint16_t>(rates, rates + 5));
 }
 
-// Rate lists from the chip file alone: no card of this id has a driver key.
-class ChipListedRates : public ::testing::Test {
-protected:
-    void SetUp() override
-    {
-        std::string ini = MakeScratchFolder("rates") + "ZNTR3.INI";
-        WriteTextFile(ini, "[CHIP7777_95]\r\n640x480x8=60,72,75\r\n800x600x16=60,75\r\n1024x768x8=59,60,72\r\n"
-                           "[CHIP7777_95E]\r\n800x600x16=85,100\r\n");
-        ResetProgramState("", ini);
-        platform = PLATFORM_9X;
-        os_class = OS_CLASS_WIN98;
-        adapter_count = 1;
-        adapter_table[0] = AdapterRecord{0x5333, 0x7777};
-        adapter_table[0].chip_row = 15;
-        SetMode(640, 480, 8);
-    }
-    void SetMode(int w, int h, int bits)
-    {
-        adapter_table[0].width = (uint16_t)w;
-        adapter_table[0].height = (uint16_t)h;
-        adapter_table[0].bits_per_pixel = (uint16_t)bits;
-    }
-};
-
-TEST_F(ChipListedRates, ExtendedRatesFollowTheBaseListUnlessTheDriverRules)
+// Lists from the chip file alone: no card of this id has a driver key.
+TEST(ChipListedRates, ExtendedListsAndTheNearestRate)
 {
+    std::string ini = MakeScratchFolder("rates") + "ZNTR3.INI";
+    WriteTextFile(ini, "[CHIP7777_95]\r\n640x480x8=60,72,75\r\n800x600x16=60,75\r\n1024x768x8=59,60,72\r\n"
+                       "[CHIP7777_95E]\r\n800x600x16=85,100\r\n");
+    ResetProgramState("", ini);
+    platform = PLATFORM_9X;
+    adapter_count = 1;
+    AdapterRecord* a = &adapter_table[0];
+    *a = AdapterRecord{0x5333, 0x7777, 0, 0, 8, 640, 480, 0, 15};
     int lo = -1, hi = -1;
     EXPECT_EQ((std::vector<int>{60, 75, 85, 100}), OfferedRates(800, 600, 16));
     EXPECT_EQ(75, MaxRefreshRate(800, 600, 16));
     EXPECT_EQ(1, CombinedRateRange(800, 600, 16, &lo, &hi));
     EXPECT_EQ(60, lo);
     EXPECT_EQ(100, hi);
-    adapter_table[0].flags |= ADAPTER_NO_CLOCK_REFRESH;
-    EXPECT_EQ((std::vector<int>{60, 75}), OfferedRates(800, 600, 16));
-    // A mode without any list.
-    EXPECT_EQ(0, RefreshRateAt(0, 1600, 1200, 8));
+    EXPECT_EQ(0, RefreshRateAt(0, 1600, 1200, 8));  // a mode without any list
     EXPECT_EQ(NO_RATE_LIMIT, MaxRefreshRate(1600, 1200, 8));
     EXPECT_EQ(0, CombinedRateRange(1600, 1200, 8, &lo, &hi));
-}
 
-TEST_F(ChipListedRates, NearestListedRateWithinNineteenHertz)
-{
-    const struct {
-        int width, height, target, nearest;
-    } cases[] = {
-        {640, 480, 73, 72}, {640, 480, 74, 75}, {640, 480, 100, 75},  // the list ends below the target
-        {640, 480, 0, 0},   {640, 480, -5, 0},  {1024, 768, 60, 60},  // a listed target is found as itself
-        {1024, 768, 59, 59}, {640, 480, 30, 0},  // 60 is more than 19 Hz away
-        {640, 480, 41, 60}, {640, 480, 40, 0},
-    };
-    for (const auto& c : cases) {
-        SetMode(c.width, c.height, 8);
-        EXPECT_EQ(c.nearest, NearestListedRefresh(c.target)) << c.width << " " << c.target;
+    // Within 19 Hz of the target, the nearer of the listed rates around it.
+    const int nearest[][4] = {{640, 480, 73, 72}, {640, 480, 74, 75}, {640, 480, 100, 75}, {640, 480, 0, 0},
+                              {640, 480, -5, 0},  {1024, 768, 60, 60}, {1024, 768, 59, 59}, {640, 480, 30, 0},
+                              {640, 480, 41, 60}, {640, 480, 40, 0}};
+    for (const auto& n : nearest) {
+        a->width = (uint16_t)n[0];
+        a->height = (uint16_t)n[1];
+        EXPECT_EQ(n[3], NearestListedRefresh(n[2])) << n[0] << " " << n[2];
     }
+    a->flags |= ADAPTER_NO_CLOCK_REFRESH;  // the driver rules: no extended rates
+    EXPECT_EQ((std::vector<int>{60, 75}), OfferedRates(800, 600, 16));
 }
