@@ -5,7 +5,9 @@
 #include "base/state.h"
 #include "modes/mode_list.h"
 
-extern "C" LONG WINAPI RegDeleteTreeA(HKEY key, LPCSTR subkey);  // declared for Vista and later only
+// Declared for Vista and later only.
+extern "C" LONG WINAPI RegDeleteTreeA(HKEY key, LPCSTR subkey);
+extern "C" LONG WINAPI RegSetKeyValueW(HKEY key, LPCWSTR subkey, LPCWSTR name, DWORD type, LPCVOID data, DWORD size);
 
 void ResetProgramState(const std::string& text_ini, const std::string& chip_ini)
 {
@@ -22,40 +24,37 @@ void DeleteRegistryTree(HKEY root, const std::string& path) { RegDeleteTreeA(roo
 void WriteRegistryString(HKEY root, const std::string& path, const std::string& name, const std::string& value,
                          bool terminated)
 {
-    HKEY key;
-    if (RegCreateKeyExA(root, path.c_str(), 0, NULL, 0, KEY_ALL_ACCESS, NULL, &key, NULL) != ERROR_SUCCESS) return;
     // Wine, like NT, adds a terminator the caller left out when a zero follows
     // the data; with something else there it stores the bytes given, as 9x does.
-    std::wstring wide_name(name.begin(), name.end()), wide_value(value.begin(), value.end());
+    std::wstring wide_path(path.begin(), path.end()), wide_name(name.begin(), name.end()),
+        wide_value(value.begin(), value.end());
     wide_value += terminated ? L'\0' : L'#';
-    RegSetValueExW(key, wide_name.c_str(), 0, REG_SZ, (const BYTE*)wide_value.c_str(),
-                   (DWORD)((wide_value.size() - !terminated) * sizeof(wchar_t)));
-    RegCloseKey(key);
+    RegSetKeyValueW(root, wide_path.c_str(), wide_name.c_str(), REG_SZ, wide_value.c_str(),
+                    (DWORD)((wide_value.size() - !terminated) * sizeof(wchar_t)));
 }
 
 std::string ReadRegistryRaw(HKEY root, const std::string& path, const std::string& name, bool* found, DWORD* type)
 {
-    if (found) *found = false;
     HKEY key;
-    if (RegOpenKeyExA(root, path.c_str(), 0, KEY_READ, &key) != ERROR_SUCCESS) return "";
-    // The stored size first: given room, a read appends a terminator the data may lack.
     char data[1024];
     DWORD size = 0, value_type = 0;
-    LONG r = RegQueryValueExA(key, name.c_str(), NULL, &value_type, NULL, &size);
-    if (r == ERROR_SUCCESS && size <= sizeof data) r = RegQueryValueExA(key, name.c_str(), NULL, &value_type, (BYTE*)data, &size);
-    RegCloseKey(key);
-    if (r != ERROR_SUCCESS || size > sizeof data) return "";
-    if (found) *found = true;
+    LONG r = RegOpenKeyExA(root, path.c_str(), 0, KEY_READ, &key);
+    if (r == ERROR_SUCCESS) {
+        // The stored size first: given room, a read appends a terminator the data may lack.
+        r = RegQueryValueExA(key, name.c_str(), NULL, &value_type, NULL, &size);
+        if (r == ERROR_SUCCESS && size > sizeof data) r = ERROR_MORE_DATA;
+        if (r == ERROR_SUCCESS) r = RegQueryValueExA(key, name.c_str(), NULL, NULL, (BYTE*)data, &size);
+        RegCloseKey(key);
+    }
+    if (found) *found = r == ERROR_SUCCESS;
     if (type) *type = value_type;
-    return std::string(data, size);
+    return r == ERROR_SUCCESS ? std::string(data, size) : "";
 }
 
 bool RegistryKeyExists(HKEY root, const std::string& path)
 {
     HKEY key;
-    if (RegOpenKeyExA(root, path.c_str(), 0, KEY_READ, &key) != ERROR_SUCCESS) return false;
-    RegCloseKey(key);
-    return true;
+    return RegOpenKeyExA(root, path.c_str(), 0, KEY_READ, &key) == ERROR_SUCCESS && RegCloseKey(key) == ERROR_SUCCESS;
 }
 
 std::string MakeScratchFolder(const char* prefix)
@@ -70,35 +69,27 @@ std::string MakeScratchFolder(const char* prefix)
 
 void WriteTextFile(const std::string& path, const std::string& text)
 {
-    HANDLE f = CreateFileA(path.c_str(), GENERIC_WRITE, 0, NULL, CREATE_ALWAYS, 0, NULL);
-    DWORD written;
-    if (f == INVALID_HANDLE_VALUE) return;
-    WriteFile(f, text.data(), (DWORD)text.size(), &written, NULL);
-    CloseHandle(f);
+    FILE* f = fopen(path.c_str(), "wb");
+    if (f) fwrite(text.data(), 1, text.size(), f), fclose(f);
 }
 
 std::string CopySimBuild(const char* prefix)
 {
     char dir[MAX_PATH] = "";
     GetEnvironmentVariableA("VISTREL_SIM_DIR", dir, sizeof dir);
-    std::string from = std::string("Z:") + dir + "\\", to = MakeScratchFolder(prefix);
-    for (char& c : from)
-        if (c == '/') c = '\\';
+    std::string from = std::string("Z:") + dir + "/", to = MakeScratchFolder(prefix);  // Wine takes '/' for '\'
     WIN32_FIND_DATAA found;
     HANDLE search = FindFirstFileA((from + "*").c_str(), &found);
-    if (search == INVALID_HANDLE_VALUE) return to;
-    do {
+    for (bool more = search != INVALID_HANDLE_VALUE; more; more = FindNextFileA(search, &found))
         if (!(found.dwFileAttributes & FILE_ATTRIBUTE_DIRECTORY))
             CopyFileA((from + found.cFileName).c_str(), (to + found.cFileName).c_str(), FALSE);
-    } while (FindNextFileA(search, &found));
-    FindClose(search);
+    if (search != INVALID_HANDLE_VALUE) FindClose(search);
     return to;
 }
 
-bool ChildProcess::Start(const std::string& command_line, const std::string& folder)
+bool ChildProcess::Start(std::string line, const std::string& folder)
 {
     STARTUPINFOA si = {sizeof si};
-    std::string line = command_line;
     return CreateProcessA(NULL, &line[0], NULL, NULL, FALSE, 0, NULL, folder.empty() ? NULL : folder.c_str(), &si,
                           &info) != 0;
 }
@@ -106,44 +97,34 @@ bool ChildProcess::Start(const std::string& command_line, const std::string& fol
 long ChildProcess::WaitExit(DWORD ms)
 {
     DWORD code = 0;
-    if (!info.hProcess || WaitForSingleObject(info.hProcess, ms) != WAIT_OBJECT_0) return -1;
-    GetExitCodeProcess(info.hProcess, &code);
-    return (long)code;
+    bool ended = info.hProcess && WaitForSingleObject(info.hProcess, ms) == WAIT_OBJECT_0;
+    return ended && GetExitCodeProcess(info.hProcess, &code) ? (long)code : -1;
 }
 
 void ChildProcess::Kill()
 {
-    if (!info.hProcess) return;
-    if (TerminateProcess(info.hProcess, 1)) WaitForSingleObject(info.hProcess, 5000);
-    CloseHandle(info.hProcess);
-    CloseHandle(info.hThread);
+    if (info.hProcess && TerminateProcess(info.hProcess, 1)) WaitForSingleObject(info.hProcess, 5000);
+    if (info.hProcess) CloseHandle(info.hProcess), CloseHandle(info.hThread);
     info = PROCESS_INFORMATION();
 }
 
-ChildProcess::~ChildProcess() { Kill(); }
-
-void SetWineVersionFor(const std::string& exe_name, const std::string& version)
-{
-    WriteRegistryString(HKEY_CURRENT_USER, "Software\\Wine\\AppDefaults\\" + exe_name, "Version", version);
-}
-
-static DialogAnswerer* active_answerer;
+static DialogAnswerer* active_answerer;  // while its hook is set
 static HHOOK answer_hook;
+
+static std::string ClassOf(HWND window)
+{
+    char name[32] = "";
+    GetClassNameA(window, name, sizeof name);
+    return name;
+}
 
 static BOOL CALLBACK ReadStatic(HWND child, LPARAM data)
 {
     std::string* out = (std::string*)data;
-    char cls[32], text[512];
-    GetClassNameA(child, cls, sizeof cls);
-    if (lstrcmpiA(cls, "Static") == 0 && GetWindowTextA(child, text, sizeof text) > 0)
+    char text[512];
+    if (ClassOf(child) == "Static" && GetWindowTextA(child, text, sizeof text) > 0)
         *out += (out->empty() ? "" : "\n") + std::string(text);
     return TRUE;
-}
-
-static bool IsDialog(HWND window)
-{
-    char cls[32] = "";
-    return window && GetClassNameA(window, cls, sizeof cls) && lstrcmpA(cls, "#32770") == 0;
 }
 
 // The box gives its button the focus in WM_INITDIALOG and becomes active
@@ -151,16 +132,16 @@ static bool IsDialog(HWND window)
 static LRESULT CALLBACK AnswerHook(int code, WPARAM wparam, LPARAM lparam)
 {
     DialogAnswerer* a = active_answerer;
+    HWND window = (HWND)wparam;
     char caption[256];
-    if (code == HCBT_SETFOCUS && a && !a->answered && IsDialog(GetParent((HWND)wparam)))
-        a->default_button = GetDlgCtrlID((HWND)wparam);
-    if (code == HCBT_ACTIVATE && a && !a->answered && IsDialog((HWND)wparam)) {
-        HWND box = (HWND)wparam;
-        GetWindowTextA(box, caption, sizeof caption);
+    if (code == HCBT_SETFOCUS && a && !a->answered && ClassOf(GetParent(window)) == "#32770")
+        a->default_button = GetDlgCtrlID(window);
+    if (code == HCBT_ACTIVATE && a && !a->answered && ClassOf(window) == "#32770") {
+        GetWindowTextA(window, caption, sizeof caption);
         a->caption = caption;
-        EnumChildWindows(box, ReadStatic, (LPARAM)&a->text);
+        EnumChildWindows(window, ReadStatic, (LPARAM)&a->text);
         a->answered = 1;
-        PostMessageA(box, WM_COMMAND, MAKEWPARAM(a->button, BN_CLICKED), (LPARAM)GetDlgItem(box, a->button));
+        PostMessageA(window, WM_COMMAND, MAKEWPARAM(a->button, BN_CLICKED), (LPARAM)GetDlgItem(window, a->button));
     }
     return CallNextHookEx(answer_hook, code, wparam, lparam);
 }
@@ -180,20 +161,16 @@ DialogAnswerer::~DialogAnswerer()
 std::vector<int> OfferedRates(int width, int height, int bits)
 {
     std::vector<int> rates;
-    for (int r; rates.size() < 40 && (r = RefreshRateAt((int)rates.size(), width, height, bits)) > 0;) rates.push_back(r);
+    while (int r = rates.size() < 40 ? RefreshRateAt((int)rates.size(), width, height, bits) : 0) rates.push_back(r);
     return rates;
 }
 
 bool PumpUntil(bool (*condition)(void*), void* data, DWORD ms)
 {
-    for (DWORD start = GetTickCount();;) {
-        MSG msg;
-        while (PeekMessageA(&msg, NULL, 0, 0, PM_REMOVE)) {
-            TranslateMessage(&msg);
-            DispatchMessageA(&msg);
-        }
-        if (condition(data)) return true;
+    MSG msg;
+    for (DWORD start = GetTickCount(); !condition(data); MsgWaitForMultipleObjects(0, NULL, FALSE, 20, QS_ALLINPUT)) {
         if (GetTickCount() - start >= ms) return false;
-        MsgWaitForMultipleObjects(0, NULL, FALSE, 20, QS_ALLINPUT);
+        while (PeekMessageA(&msg, NULL, 0, 0, PM_REMOVE)) TranslateMessage(&msg), DispatchMessageA(&msg);
     }
+    return true;
 }

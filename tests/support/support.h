@@ -8,12 +8,11 @@
 #include <string>
 #include <vector>
 
-// Every module as a fresh process has it, with the INI paths pointing at
-// the given files (empty: files that do not exist).
+// Every module as a fresh process has it, the INI paths naming the given
+// files (empty: files that do not exist).
 void ResetProgramState(const std::string& text_ini = "", const std::string& chip_ini = "");
 
-// The settings store's program key, removed with everything below it.
-void ClearSettingsStore();
+void ClearSettingsStore();  // the settings store's program key and all below it
 void DeleteRegistryTree(HKEY root, const std::string& path);
 // terminated false stores the bytes without their terminator, as 9x may.
 void WriteRegistryString(HKEY root, const std::string& path, const std::string& name, const std::string& value,
@@ -31,32 +30,23 @@ std::string CopySimBuild(const char* prefix);
 
 struct ChildProcess {
     PROCESS_INFORMATION info = {};
-    bool Start(const std::string& command_line, const std::string& folder = "");
-    // The exit code, or -1 when the process is still running after ms.
-    long WaitExit(DWORD ms);
+    bool Start(std::string command_line, const std::string& folder = "");
+    long WaitExit(DWORD ms);  // the exit code, or -1 while it runs
     void Kill();
-    ~ChildProcess();
+    ~ChildProcess() { Kill(); }
 };
 
-// Makes Wine report this Windows version ("win95", "win98", "nt40") to every
-// process started from that executable name.
-void SetWineVersionFor(const std::string& exe_name, const std::string& version);
-
-// Presses a button of the next message box or dialog that this thread shows,
-// and remembers its texts and the button that Enter would have pressed.
-class DialogAnswerer {
-public:
+// Presses a button of the next message box or dialog this thread shows, and
+// remembers its texts and the button that Enter would have pressed.
+struct DialogAnswerer {
     explicit DialogAnswerer(int button);
     ~DialogAnswerer();
-    int answered = 0;
-    int default_button = 0;
+    int button, answered = 0, default_button = 0;
     std::string text, caption;
-    int button;
 };
 
 // The rates RefreshRateAt offers for a mode, in order, until the list ends.
 std::vector<int> OfferedRates(int width, int height, int bits);
-
 // Pumps this thread's messages until the condition holds or ms pass.
 bool PumpUntil(bool (*condition)(void*), void* data, DWORD ms);
 

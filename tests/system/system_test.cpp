@@ -44,7 +44,8 @@ struct Panel {
     void Describe(const std::string& machine) { WriteTextFile(folder + "SIMMACHINE.INI", machine); }
     bool Start(const char* version, const std::string& arguments = "")
     {
-        SetWineVersionFor("vistrel-sim.exe", version);
+        // The Windows Wine reports to this executable: "win95", "win98" or "nt40".
+        WriteRegistryString(HKEY_CURRENT_USER, "Software\\Wine\\AppDefaults\\vistrel-sim.exe", "Version", version);
         return process.Start("\"" + folder + "vistrel-sim.exe\" " + arguments, folder);
     }
     // The main window once it answers, NULL when the process ended or 30 s passed.
