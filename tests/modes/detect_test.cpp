@@ -24,8 +24,8 @@ static SimCardConfig C(uint16_t vendor, uint16_t device, uint8_t bus, uint8_t sl
 static SimMachineConfig MachineOf(int windows, const SimCardConfig* cards, int count)
 {
     SimMachineConfig config = Machine(windows, {});
-    while (config.card_count < count && cards[config.card_count].vendor_id)
-        config.cards[config.card_count] = cards[config.card_count], ++config.card_count;
+    for (; config.card_count < count && cards[config.card_count].vendor_id; ++config.card_count)
+        config.cards[config.card_count] = cards[config.card_count];
     return config;
 }
 
