@@ -11,30 +11,20 @@
 static uint8_t file[256];
 static std::string accesses;
 
-static void Log(const char* format, int index, int value = 0)
+static std::string Hex(int v)
 {
-    char line[12];
-    snprintf(line, sizeof line, format, index, value);
-    accesses += line;
+    char text[4];
+    snprintf(text, sizeof text, "%02X", v);
+    return text;
 }
-
-static uint8_t Read(uint8_t index)
-{
-    Log(" r%02X", index);
-    return file[index];
-}
-
-static void Write(uint8_t index, uint8_t value)
-{
-    Log(" w%02X=%02X", index, value);
-    file[index] = value;
-}
+static uint8_t Read(uint8_t i) { return accesses += " r" + Hex(i), file[i]; }
+static void Write(uint8_t i, uint8_t value) { accesses += " w" + Hex(i) + "=" + Hex(value), file[i] = value; }
 
 static const RegAccess junk_file = {.read = Read, .write = Write};
 
 static constexpr RegField vertical_total = {{0x06, 0, 7}, {0x07, 0, 0}, {0x07, 5, 5}, {0x5E, 0, 0}};
-static constexpr RegField m7 = {{0x13, 0, 6}}, n5 = {{0x12, 0, 4}}, r3 = {{0x12, 5, 7}}, r2 = {{0x12, 5, 6}};
-static constexpr RegField bit7 = {{0x12, 7, 7}};
+static constexpr RegField m7 = {{0x13, 0, 6}}, n5 = {{0x12, 0, 4}}, r3 = {{0x12, 5, 7}}, r2 = {{0x12, 5, 6}},
+                          bit7 = {{0x12, 7, 7}};
 static constexpr RegField m9 = {{0x13, 0, 7}, {0x29, 3, 3}}, n7 = {{0x12, 0, 5}, {0x29, 4, 4}};
 static constexpr RegField r3_high = {{0x12, 6, 7}, {0x29, 2, 2}};
 static const uint8_t sr29_first[] = {0x29};
@@ -42,12 +32,12 @@ static_assert(vertical_total.Highest() == 0x7FF && m9.Highest() == 511);
 
 TEST(RegField, WritesEachRegisterOnceKeepingTheOtherBits)
 {
-    struct Case {
+    const struct {  // the fields' values, the registers named first, the accesses, the fields read back
         const char* what;
         RegFieldValue values[3];
         int count;
         const uint8_t* first;
-        const char* expected;  // the accesses
+        const char* expected;
         uint32_t read_back[3];
     } cases[] = {
         {"bits above the field are dropped; CR07 read and written once",
@@ -59,7 +49,7 @@ TEST(RegField, WritesEachRegisterOnceKeepingTheOtherBits)
          " r29 w29=B9 w13=2C w12=46", {300, 70, 1}},
         {"a register named first but in no field is left alone", {{&m7, 1}}, 1, sr29_first, " r13 w13=81", {1}},
     };
-    for (const Case& c : cases) {
+    for (const auto& c : cases) {
         memset(file, 0xA5, sizeof file);
         accesses.clear();
         WriteFields(&junk_file, c.values, c.count, c.first, c.first ? 1 : 0);

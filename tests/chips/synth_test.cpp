@@ -2,20 +2,19 @@
 
 #include "chips/synth.h"
 
-// The S3 memory clock: M 1..127, N 1..31, R 0..3, VCO 135 to 270 MHz.
-static const SynthLimits mclk = {.fref_hz = 14318180.0, .a = 2, .b = 2, .m_min = 1, .m_max = 127,
-                                 .n_min = 1, .n_max = 31, .r_min = 0, .r_max = 3,
-                                 .vco_min_hz = 135e6, .vco_max_hz = 270e6};
-// The Trio64V2 pixel clock: R up to 4, VCO 140 to 340 MHz.
-static const SynthLimits trio64v2_dclk = {.fref_hz = 14318180.0, .a = 2, .b = 2, .m_min = 1, .m_max = 127,
-                                          .n_min = 1, .n_max = 31, .r_min = 0, .r_max = 4,
-                                          .vco_min_hz = 140e6, .vco_max_hz = 340e6};
+// M 1..127 and N 1..31 of the S3 chips.
+static constexpr SynthLimits S3(uint16_t r_max, double vco_min_hz, double vco_max_hz)
+{
+    return {.fref_hz = 14318180.0, .a = 2, .b = 2, .m_min = 1, .m_max = 127, .n_min = 1, .n_max = 31,
+            .r_min = 0, .r_max = r_max, .vco_min_hz = vco_min_hz, .vco_max_hz = vco_max_hz};
+}
+static constexpr SynthLimits mclk = S3(3, 135e6, 270e6), trio64v2_dclk = S3(4, 140e6, 340e6);
 
 // Each search starts from the N and R of the setting; without a fit the
 // setting comes back unchanged.
 TEST(SynthesizerSearch, StepsFromTheCurrentDividerForTwentyTriesAtMost)
 {
-    struct Case {
+    const struct {
         const char* what;
         const SynthLimits* limits;
         double target_hz;
@@ -31,7 +30,7 @@ TEST(SynthesizerSearch, StepsFromTheCurrentDividerForTwentyTriesAtMost)
         {"too low a target", &mclk, 1000.0, {7, 12, 1}, 0, {7, 12, 1}},
         {"too low a target at the lowest dividers", &mclk, 1000.0, {7, 1, 0}, 0, {7, 1, 0}},
     };
-    for (const Case& c : cases) {
+    for (const auto& c : cases) {
         SynthSetting s = c.start;
         EXPECT_EQ(c.fits, SearchSynthesizer(c.limits, c.target_hz, &s)) << c.what;
         EXPECT_TRUE(s.m == c.end.m && s.n == c.end.n && s.r == c.end.r)
@@ -39,20 +38,16 @@ TEST(SynthesizerSearch, StepsFromTheCurrentDividerForTwentyTriesAtMost)
     }
 }
 
+// M is truncated: a fit lies below the target by less than one step of M.
 TEST(SynthesizerSearch, EveryFitLiesInTheWindowAndBelowTheTarget)
 {
-    for (double target = 25e6; target <= 135e6; target += 1.7e6) {
-        for (uint16_t n = 1; n <= 31; n += 5) {
+    for (double target = 25e6; target <= 135e6; target += 1.7e6)
+        for (uint16_t n = 1; n <= 31; n += 5)
             for (uint16_t r = 0; r <= 4; ++r) {
                 SynthSetting s = {1, n, r};
                 if (!SearchSynthesizer(&trio64v2_dclk, target, &s)) continue;
-                double vco = trio64v2_dclk.fref_hz * (s.m + 2) / (s.n + 2);
-                EXPECT_GE(vco, 140e6);
-                EXPECT_LE(vco, 340e6);
-                double f = SynthFrequency(&trio64v2_dclk, s);
-                EXPECT_LE(f, target);  // M is truncated
-                EXPECT_GT(f, target - trio64v2_dclk.fref_hz / ((s.n + 2) << s.r) - 1);
+                double vco = trio64v2_dclk.fref_hz * (s.m + 2) / (s.n + 2), f = SynthFrequency(&trio64v2_dclk, s);
+                EXPECT_TRUE(vco >= 140e6 && vco <= 340e6) << vco;
+                EXPECT_TRUE(f <= target && f > target - trio64v2_dclk.fref_hz / ((s.n + 2) << s.r) - 1) << f;
             }
-        }
-    }
 }

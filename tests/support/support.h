@@ -8,13 +8,13 @@
 #include <string>
 #include <vector>
 
-// Every global of the program as a fresh process has it, with the INI paths
-// pointing at the given files (empty: files that do not exist).
+// Every module as a fresh process has it, the INI paths naming the given
+// files (empty: files that do not exist).
 void ResetProgramState(const std::string& text_ini = "", const std::string& chip_ini = "");
 
-// The settings store's program key, removed with everything below it.
-void ClearSettingsStore();
+void ClearSettingsStore();  // the settings store's program key and all below it
 void DeleteRegistryTree(HKEY root, const std::string& path);
+// terminated false stores the bytes without their terminator, as 9x may.
 void WriteRegistryString(HKEY root, const std::string& path, const std::string& name, const std::string& value,
                          bool terminated = true);
 // The raw bytes of a value; found is false when it cannot be read.
@@ -22,47 +22,32 @@ std::string ReadRegistryRaw(HKEY root, const std::string& path, const std::strin
                             DWORD* type = nullptr);
 bool RegistryKeyExists(HKEY root, const std::string& path);
 
-// A new empty folder below the temporary folder, as a Windows path with a
-// trailing backslash.
+// A new empty folder below the temporary folder, with a trailing backslash.
 std::string MakeScratchFolder(const char* prefix);
 void WriteTextFile(const std::string& path, const std::string& text);
-// A Windows path for a path of the Linux side (Wine's Z: drive).
-std::string WindowsPathOf(const std::string& unix_path);
-// build/sim as a Windows path with a trailing backslash (from VISTREL_SIM_DIR).
-std::string SimBuildFolder();
-// A private copy of build/sim's files in a new scratch folder.
+// A private copy of build/sim's files (VISTREL_SIM_DIR) in a new scratch folder.
 std::string CopySimBuild(const char* prefix);
 
 struct ChildProcess {
     PROCESS_INFORMATION info = {};
-    bool Start(const std::string& command_line, const std::string& folder = "");
-    // The exit code, or -1 when the process is still running after ms.
-    long WaitExit(DWORD ms);
+    bool Start(std::string command_line, const std::string& folder = "");
+    long WaitExit(DWORD ms);  // the exit code, or -1 while it runs
     void Kill();
-    ~ChildProcess();
+    ~ChildProcess() { Kill(); }
 };
 
-// Makes Wine report this Windows version ("win95", "win98", "nt40") to every
-// process started from that executable name.
-void SetWineVersionFor(const std::string& exe_name, const std::string& version);
-
-// Presses a button of the next message box or dialog that this thread shows,
-// and remembers its text. Works from inside the box's own message loop.
-class DialogAnswerer {
-public:
+// Presses a button of the next message box or dialog this thread shows, and
+// remembers its texts and the button that Enter would have pressed.
+struct DialogAnswerer {
     explicit DialogAnswerer(int button);
     ~DialogAnswerer();
-    int answered = 0;
-    std::string text;
-    std::string caption;
-    int button;
+    int button, answered = 0, default_button = 0;
+    std::string text, caption;
 };
 
 // The rates RefreshRateAt offers for a mode, in order, until the list ends.
 std::vector<int> OfferedRates(int width, int height, int bits);
-
 // Pumps this thread's messages until the condition holds or ms pass.
 bool PumpUntil(bool (*condition)(void*), void* data, DWORD ms);
-void PumpMessages();
 
 #endif
