@@ -1,5 +1,7 @@
 # Test executables (one per folder) and the runs CTest makes of them.
 vistrel_test(shell)
+# The tray menu's icons and the panning dialog are resources of the program.
+target_sources(test-shell PRIVATE ${VISTREL_ROOT}/resources/vistrel.rc)
 vistrel_add_test(shell shell)
 
 # The product's runtime body, built for this machine without a C runtime,

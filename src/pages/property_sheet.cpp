@@ -55,6 +55,14 @@ static bool PageIncluded(int page)
     return chip_hide_page((uint32_t)page) == 0;
 }
 
+unsigned IncludedPages()
+{
+    unsigned included = 0;
+    for (int page = 0; page < PAGE_COUNT; ++page)
+        if (PageIncluded(page)) included |= 1u << page;
+    return included;
+}
+
 int StartPosition(unsigned included, int requested_page)
 {
     int before = 0;

@@ -11,6 +11,10 @@
 // base/texts.h); returns when the user closes it.
 void OpenPropertySheet(HINSTANCE inst, HWND owner, int requested_page);
 
+// The pages the chip of the adapter at current_adapter allows: bit n for
+// page n.
+unsigned IncludedPages();
+
 // The position of the requested page among the included ones (bit n of
 // included set for page n): its own, or that of the included page before
 // it, or 0.

@@ -4,13 +4,14 @@
 #include "base/state.h"
 #include "base/texts.h"
 #include "chips/chips.h"
-#include "hardware/companions.h"
 #include "modes/detect.h"
 #include "modes/display_settings.h"
 #include "modes/mode_change.h"
 #include "modes/mode_list.h"
 #include "modes/position.h"
+#include "shell/commands.h"
 #include "shell/tray.h"
+#include "shell/tray_menu.h"
 
 enum { NOCARD_TEXT_SIZE = 80 };
 
@@ -23,11 +24,7 @@ static void OnCreate(HWND window)
         DestroyWindow(window);
         return;
     }
-    // Every adapter's current mode; with "/A" the saved refresh rate and
-    // picture position come back here.
-    RefreshAdapterModes(REFRESH_AT_STARTUP);
-    last_activity_tick = GetTickCount();
-    StartPowerTimers(window, 1);
+    AddTrayIcon(window);
     startup_flags &= ~STARTUP_AUTORUN;
 }
 
@@ -100,7 +97,7 @@ LRESULT CALLBACK MainWindowProc(HWND window, UINT message, WPARAM wparam, LPARAM
         OnCreate(window);
         return 0;
     case WM_DESTROY:
-        StartPowerTimers(window, 0);
+        RemoveTrayIcon(window);
         PostQuitMessage(0);
         return 0;
     case WM_PAINT:
@@ -110,6 +107,18 @@ LRESULT CALLBACK MainWindowProc(HWND window, UINT message, WPARAM wparam, LPARAM
     case WM_CANCELMODE:
         shell_state &= ~STATE_MENU_PENDING;
         break;
+    case WM_MEASUREITEM:
+        MeasureMenuItem((MEASUREITEMSTRUCT*)lparam);
+        return 1;
+    case WM_DRAWITEM:
+        DrawMenuItem((const DRAWITEMSTRUCT*)lparam);
+        return 1;
+    case WM_COMMAND:
+        if (OnMenuCommand(window, LOWORD(wparam))) return 0;
+        break;
+    case MSG_TRAY_CALLBACK:
+        OnTrayCallback(window, wparam, lparam);
+        return 0;
     case WM_DISPLAYCHANGE:
         ForgetDisplaySettings();
         OnDisplayChange(window);
@@ -122,6 +131,8 @@ LRESULT CALLBACK MainWindowProc(HWND window, UINT message, WPARAM wparam, LPARAM
         return OnSetRefreshMessage(wparam);
     case MSG_POWER_STATE:
         return OnPowerStateMessage(wparam);
+    default:
+        if (OnTaskbarCreated(window, message)) return 0;
     }
     return DefWindowProcA(window, message, wparam, lparam);
 }
