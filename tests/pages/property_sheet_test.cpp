@@ -94,7 +94,7 @@ LRESULT CALLBACK RecordOpen(int code, WPARAM wparam, LPARAM lparam)
 TEST(PageAnimation, ChipFileNamesAFileBesideTheProgram)
 {
     const std::string folder = ProgramFolder();
-    const std::string clip = WindowsPathOf(VISTREL_RESOURCES "/pages.avi");
+    const std::string clip = std::string("Z:") + VISTREL_RESOURCES "/pages.avi";
     static const struct {
         const char* entry;  // the chip file's AVIFile line
         const char* file;   // what lies beside the program under that name

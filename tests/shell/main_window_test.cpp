@@ -11,7 +11,7 @@
 #include "support/machine.h"
 #include "support/support.h"
 
-TEST(Tray, MainWindowSpotIsTheCornerAtTheFarEndOfTheTaskbar)
+TEST(TaskbarCorner, MainWindowSpotIsTheCornerAtTheFarEndOfTheTaskbar)
 {
     static const struct { RECT taskbar; LONG x, y; } cases[] = {
         {{0, 740, 1024, 768}, 1023, 767}, {{994, 0, 1024, 768}, 1023, 767},  // bottom, right

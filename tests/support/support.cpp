@@ -73,11 +73,16 @@ void WriteTextFile(const std::string& path, const std::string& text)
     if (f) fwrite(text.data(), 1, text.size(), f), fclose(f);
 }
 
-std::string CopySimBuild(const char* prefix)
+std::string SimBuildFolder()
 {
     char dir[MAX_PATH] = "";
     GetEnvironmentVariableA("VISTREL_SIM_DIR", dir, sizeof dir);
-    std::string from = std::string("Z:") + dir + "/", to = MakeScratchFolder(prefix);  // Wine takes '/' for '\'
+    return std::string("Z:") + dir + "/";  // Wine takes '/' for '\'
+}
+
+std::string CopySimBuild(const char* prefix)
+{
+    std::string from = SimBuildFolder(), to = MakeScratchFolder(prefix);
     WIN32_FIND_DATAA found;
     HANDLE search = FindFirstFileA((from + "*").c_str(), &found);
     for (bool more = search != INVALID_HANDLE_VALUE; more; more = FindNextFileA(search, &found))

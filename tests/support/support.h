@@ -26,6 +26,8 @@ bool RegistryKeyExists(HKEY root, const std::string& path);
 std::string MakeScratchFolder(const char* prefix);
 void WriteTextFile(const std::string& path, const std::string& text);
 // A private copy of build/sim's files (VISTREL_SIM_DIR) in a new scratch folder.
+// build/sim as Wine sees it, with a trailing separator.
+std::string SimBuildFolder();
 std::string CopySimBuild(const char* prefix);
 
 struct ChildProcess {

@@ -6,6 +6,13 @@
 #include <math.h>
 #include <stdlib.h>
 
+#include <windows.h>
+#include <commctrl.h>
+#include <prsht.h>
+#include <shellapi.h>
+
+#include <algorithm>
+#include <string>
 #include <vector>
 
 #include "support/support.h"
@@ -38,6 +45,17 @@ static std::string Name(const DEVMODEA& m)
     return std::to_string(m.dmPelsWidth) + "x" + std::to_string(m.dmPelsHeight) + "x" + std::to_string(m.dmBitsPerPel);
 }
 
+static const int icon_id = 100;
+
+static bool IconShown(HWND window)
+{
+    NOTIFYICONDATAA data = {};
+    data.cbSize = NOTIFYICONDATAA_V1_SIZE;
+    data.hWnd = window;
+    data.uID = icon_id;
+    return Shell_NotifyIconA(NIM_MODIFY, &data);
+}
+
 // A private copy of build/sim with its own machine.
 struct Panel {
     explicit Panel(const std::string& machine) : folder(CopySimBuild("panel")) { Describe(machine); }
@@ -48,13 +66,14 @@ struct Panel {
         WriteRegistryString(HKEY_CURRENT_USER, "Software\\Wine\\AppDefaults\\vistrel-sim.exe", "Version", version);
         return process.Start("\"" + folder + "vistrel-sim.exe\" " + arguments, folder);
     }
-    // The main window once it answers, NULL when the process ended or 30 s passed.
+    // The main window once its icon is in the taskbar, which is after the
+    // start-up's work; NULL when the process ended or 30 s passed.
     HWND WaitWindow()
     {
         DWORD_PTR r;
         for (DWORD start = GetTickCount(); GetTickCount() - start < 30000 && process.WaitExit(20) == -1;) {
             HWND w = FindWindowA("zentra", NULL);
-            if (w && SendMessageTimeoutA(w, WM_NULL, 0, 0, SMTO_NORMAL, 30000, &r)) return w;
+            if (w && SendMessageTimeoutA(w, WM_NULL, 0, 0, SMTO_NORMAL, 30000, &r) && IconShown(w)) return w;
         }
         return NULL;
     }
@@ -126,6 +145,71 @@ protected:
     }
 };
 
+static const UINT msg_tray_callback = 1224;
+static const int monitor_list_id = 1039, close_command = 209;
+
+struct Search {
+    DWORD process;
+    const char* cls;
+    HWND found;
+};
+
+static BOOL CALLBACK FindShown(HWND window, LPARAM data)
+{
+    Search* s = (Search*)data;
+    char cls[32] = "";
+    DWORD process = 0;
+    GetWindowThreadProcessId(window, &process);
+    GetClassNameA(window, cls, sizeof cls);
+    if (process != s->process || strcmp(cls, s->cls) || !IsWindowVisible(window)) return TRUE;
+    s->found = window;
+    return FALSE;
+}
+
+// A shown top-level window of the panel's process, once it is there.
+static HWND WaitShown(Panel& panel, const char* cls, DWORD ms = 10000)
+{
+    Search s = {panel.process.info.dwProcessId, cls, NULL};
+    for (DWORD start = GetTickCount(); GetTickCount() - start < ms; Sleep(20)) {
+        EnumWindows(FindShown, (LPARAM)&s);
+        if (s.found) return s.found;
+    }
+    return NULL;
+}
+
+static bool WaitGoneWindow(HWND window, DWORD ms = 10000)
+{
+    for (DWORD start = GetTickCount(); GetTickCount() - start < ms; Sleep(20))
+        if (!IsWindow(window)) return true;
+    return false;
+}
+
+// Key presses posted to a window of another process, as the keyboard would
+// bring them to its queue.
+static void PressKeys(HWND window, std::initializer_list<UINT> keys)
+{
+    for (UINT key : keys) {
+        PostMessageA(window, WM_KEYDOWN, key, 1);
+        PostMessageA(window, WM_KEYUP, key, 0xC0000001);
+    }
+}
+
+// Another process's list box: only the wide form crosses processes intact.
+static std::vector<std::string> ListLines(HWND list)
+{
+    std::vector<std::string> lines;
+    LRESULT count = SendMessageW(list, LB_GETCOUNT, 0, 0);
+    for (LRESULT i = 0; i < count; ++i) {
+        wchar_t text[256] = L"";
+        SendMessageW(list, LB_GETTEXT, i, (LPARAM)text);
+        std::string line;
+        for (const wchar_t* c = text; *c; ++c) line += (char)*c;
+        lines.push_back(line);
+    }
+    return lines;
+}
+
+
 TEST_F(SystemTest, OnWindows98)
 {
     Panel panel(MachineIni("98"));
@@ -133,12 +217,16 @@ TEST_F(SystemTest, OnWindows98)
     HWND w = panel.WaitWindow();
     ASSERT_NO_FATAL_FAILURE(ExpectHidden(w));
 
-    // A second start wakes this copy and ends.
+    // A second start opens this copy's menu and ends.
     ChildProcess second;
     ASSERT_TRUE(second.Start("\"" + panel.folder + "vistrel-sim.exe\"", panel.folder));
     EXPECT_EQ(0, second.WaitExit(30000));
     EXPECT_EQ(-1, panel.process.WaitExit(0));
     EXPECT_EQ(w, FindWindowA("zentra", NULL));
+    HWND menu = WaitShown(panel, "#32768");
+    ASSERT_TRUE(menu != NULL) << "no menu";
+    PressKeys(menu, {VK_ESCAPE});
+    ASSERT_TRUE(WaitGoneWindow(menu) || !IsWindowVisible(menu));
 
     // Other programs read the driver's rates, then the chip file's, and the rate the card runs.
     const char* modes_key = "System\\CurrentControlSet\\Services\\Class\\DISPLAY\\0000\\MODES\\8\\640,480";
@@ -241,4 +329,42 @@ TEST_F(SystemTest, NoSupportedCardShowsTheTextAndEnds)
     EXPECT_NE(std::string::npos, all.find("Nothing to drive here (test).")) << all;
     PostMessageA(find.second, WM_COMMAND, IDOK, 0);
     EXPECT_EQ(0, panel.process.WaitExit(15000));
+}
+
+// The panel's face as the user meets it: the icon in the taskbar, its menu,
+// a page chosen with the keyboard, and the way out.
+TEST_F(SystemTest, FromTheTrayIconToTheMonitorPageAndOut)
+{
+    Panel panel(MachineIni("98"));
+    ASSERT_TRUE(panel.Start("win98"));
+    HWND main = panel.WaitWindow();
+    ASSERT_TRUE(main != NULL);
+    EXPECT_TRUE(IconShown(main));
+
+    // The shell's click; Desktop, Information, Monitor.
+    PostMessageA(main, msg_tray_callback, 0, WM_LBUTTONDOWN);
+    HWND menu = WaitShown(panel, "#32768");
+    ASSERT_TRUE(menu != NULL) << "no menu";
+    PressKeys(menu, {VK_DOWN, VK_DOWN, VK_DOWN, VK_RETURN});
+
+    HWND sheet = WaitShown(panel, "#32770");
+    ASSERT_TRUE(sheet != NULL) << "no sheet";
+    HWND page = (HWND)SendMessageA(sheet, PSM_GETCURRENTPAGEHWND, 0, 0);
+    HWND list = GetDlgItem(page, monitor_list_id);
+    ASSERT_TRUE(list != NULL) << "not the Monitor page";
+    std::vector<std::string> lines = ListLines(list);
+    const std::vector<std::string> edid = {"Year of Manufacture :", "        1998", "Max H. Image Size(cm) :",
+                                           "        30", "Max V. Image Size(cm) :", "        23"};
+    auto year = std::find(lines.begin(), lines.end(), edid[0]);
+    ASSERT_TRUE(lines.end() - year >= (long)edid.size()) << "no EDID lines among " << lines.size();
+    EXPECT_EQ(edid, std::vector<std::string>(year, year + edid.size()));
+    PostMessageA(sheet, PSM_PRESSBUTTON, PSBTN_CANCEL, 0);
+    ASSERT_TRUE(WaitGoneWindow(sheet));
+
+    PostMessageA(main, WM_COMMAND, close_command, 0);
+    HWND question = WaitShown(panel, "#32770");
+    ASSERT_TRUE(question != NULL && GetDlgItem(question, IDYES)) << "no question";
+    PostMessageA(question, WM_COMMAND, IDYES, 0);
+    EXPECT_EQ(0, panel.process.WaitExit(10000));
+    EXPECT_FALSE(IconShown(main));
 }
