@@ -65,13 +65,19 @@ TEST_F(ModeChange, RatesThatChangeNothing)
     EXPECT_NEAR(MaxRefreshRate(a->width, a->height, a->bits_per_pixel), SimRefreshHz(0), 1.0);
 }
 
+// Through the rate alone or a whole mode change, the chosen rate runs and is stored.
 TEST_F(ModeChange, TheModeKeyHoldsTheListsMaximumUnlessTheChipIsUnclamped)
 {
-    for (uint32_t flag : {0u, (uint32_t)ADAPTER_UNCLAMPED_RATE}) {
+    const struct { uint32_t flag; bool whole_mode; } ways[] = {{0, false}, {ADAPTER_UNCLAMPED_RATE, false}, {0, true}};
+    for (const auto& w : ways) {
         ASSERT_NO_FATAL_FAILURE(Boot(SIM_WINDOWS_98));
-        a->flags |= flag;
-        ASSERT_EQ(1, SetRefreshRate(extended));
-        EXPECT_EQ(flag ? extended : extended - 15, ModeKeyRefresh(a->width, a->height, a->bits_per_pixel, 0, 0));
+        a->flags |= w.flag;
+        if (w.whole_mode)
+            ASSERT_EQ(DISP_CHANGE_SUCCESSFUL, ApplyDisplayMode(NULL, DM_PELSWIDTH | DM_PELSHEIGHT, a->width, a->height,
+                                                               a->bits_per_pixel, 96, 96, extended));
+        else
+            ASSERT_EQ(1, SetRefreshRate(extended));
+        EXPECT_EQ(w.flag ? extended : extended - 15, ModeKeyRefresh(a->width, a->height, a->bits_per_pixel, 0, 0));
         EXPECT_NEAR(extended, SimRefreshHz(0), 2.0);
         EXPECT_EQ(extended, MeasuredRefreshRate());
         const int stored[][2] = {{SETTING_REFRESH, extended}, {SETTING_WIDTH, a->width}, {SETTING_HEIGHT, a->height},
