@@ -177,6 +177,7 @@ BOOL MachineCloseDevice(HANDLE device)
     uintptr_t v = (uintptr_t)device;
     if (HandleKind(device) == DEVICE_NONE) return Fail(ERROR_INVALID_HANDLE);
     handles[(v - handle_base) / 4] = DEVICE_NONE;
+    sim_counters.device_closes++;
     return TRUE;
 }
 

@@ -170,7 +170,7 @@ void SimSetModeList(const SimListedMode* modes, int count);
 struct SimCounters {
     uint32_t port_reads, port_writes;
     uint32_t window_reads, window_writes;
-    uint32_t device_opens, device_requests;
+    uint32_t device_opens, device_requests, device_closes;
     uint32_t enum_settings_calls;  // EnumDisplaySettingsA of any mode number
     uint32_t enum_settings_walks;  // ... of mode number 0: the start of a walk
     uint32_t mode_changes;

@@ -65,6 +65,17 @@ TEST_F(ModeChange, RatesThatChangeNothing)
     EXPECT_NEAR(MaxRefreshRate(a->width, a->height, a->bits_per_pixel), SimRefreshHz(0), 1.0);
 }
 
+// NT lends its kernel device per change: a handle kept would be one more
+// each time the rate is set.
+TEST_F(ModeChange, TheKernelDeviceOpenedForARateIsClosedAgain)
+{
+    ASSERT_NO_FATAL_FAILURE(Boot(SIM_WINDOWS_NT4));
+    SimResetCounters();
+    ASSERT_EQ(1, SetRefreshRate(extended));
+    EXPECT_GE(SimGetCounters()->device_opens, 1u);
+    EXPECT_EQ(SimGetCounters()->device_opens, SimGetCounters()->device_closes);
+}
+
 // Through the rate alone or a whole mode change, the chosen rate runs and is stored.
 TEST_F(ModeChange, TheModeKeyHoldsTheListsMaximumUnlessTheChipIsUnclamped)
 {
