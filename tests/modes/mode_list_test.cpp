@@ -118,8 +118,10 @@ TEST(ModeList, AHundredModesFillTheTableAndEndTheEnumeration)
 {
     ASSERT_NO_FATAL_FAILURE(BootDefaultAndDetect(SIM_WINDOWS_98));
     static SimListedMode modes[120];
-    for (int i = 0; i < 120; ++i) modes[i] = SimListedMode{(uint16_t)(640 + 8 * i), 480, 8, 1, {60}};
-    modes[119].width = 600;  // would sort first, were it taken
+    // The driver lists them widest first; beyond the hundredth, a mode that
+    // would sort first, were it taken.
+    for (int i = 0; i < 120; ++i)
+        modes[i] = SimListedMode{(uint16_t)(i < 100 ? 640 + 8 * (99 - i) : 600), 480, 8, 1, {60}};
     SimSetModeList(modes, 120);
     ForgetDisplaySettings();
     BuildModeTable(0);
