@@ -68,14 +68,16 @@ void SeeAndCancel(HWND dialog)
     char text[64] = "";
     HWND tab = FindWindowExA(dialog, NULL, WC_TABCONTROLA, NULL), no = GetDlgItem(dialog, IDNO);
     TCITEMA item = {TCIF_TEXT, 0, 0, text, sizeof text};
-    if (!tab) GetWindowTextA(dialog, text, sizeof text);
+    if (tab) SendMessageA(tab, TCM_GETITEMA, SendMessageA(tab, TCM_GETCURSEL, 0, 0), (LPARAM)&item);
+    else GetWindowTextA(dialog, text, sizeof text);
     if (no) sprintf(text + strlen(text), ", default %d", GetDlgCtrlID(GetFocus()));
-    if (tab && SendMessageA(tab, TCM_GETITEMA, SendMessageA(tab, TCM_GETCURSEL, 0, 0), (LPARAM)&item)) {
+    const bool first_sheet = tab && seen.find("sheet") == std::string::npos;
+    See((tab ? "sheet " + std::to_string(current_adapter) + " " : std::string("dialog ")) + text);
+    if (first_sheet) {
         EXPECT_EQ(0, OnMenuCommand(stand_in, MENU_FIRST_PAGE));
         EXPECT_TRUE(GetForegroundWindow() != stand_in && !OnTrayCallback(stand_in, 0, WM_LBUTTONDOWN));
         EXPECT_TRUE(GetForegroundWindow() == stand_in && shell_state == STATE_COMMAND_RUNNING);
     }
-    See((tab ? "sheet " + std::to_string(current_adapter) + " " : std::string("dialog ")) + text);
     PostMessageA(dialog, WM_COMMAND, no ? IDNO : IDCANCEL, 0);
 }
 
