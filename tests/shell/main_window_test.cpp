@@ -110,7 +110,7 @@ std::string MenuText(HMENU menu)
     return text;
 }
 
-class Tray : public ::testing::Test {
+class MainWindow : public ::testing::Test {
 protected:
     void TearDown() override { DestroyWindow(stand_in), ClearSettingsStore(); }
     // S3 cards of distinct kinds and display devices, of the test family; the menu; a 1 x 1 stand-in window.
@@ -151,7 +151,7 @@ std::string Vgas(int cards, unsigned pages = 0xF)
     return menus;
 }
 
-TEST_F(Tray, MenuOffersWhatTheChipsAllow)
+TEST_F(MainWindow, MenuOffersWhatTheChipsAllow)
 {
     const std::string fixed = "201 Display Properties|202 DirectX Info|210 Zoom In|207 Minimize|209 Close";
     const std::string tail = "Power Saving[211 'Stand By'|212 'Suspend'|213 'Shutoff']|" + fixed;
@@ -173,7 +173,7 @@ TEST_F(Tray, MenuOffersWhatTheChipsAllow)
     }
 }
 
-TEST_F(Tray, MenuIconsAndDrawingKeepNoGdiObject)
+TEST_F(MainWindow, MenuIconsAndDrawingKeepNoGdiObject)
 {
     ASSERT_NO_FATAL_FAILURE(Start(SIM_WINDOWS_98, 2));
     // Wine's GetGuiResources answers 0: the handle table is walked instead.
@@ -223,7 +223,7 @@ TEST(TaskbarCorner, MainWindowSpotIsTheCornerAtTheFarEndOfTheTaskbar)
     }
 }
 
-TEST_F(Tray, RedrawReappliesAfterQuietTimeWithTheTrayFree)
+TEST_F(MainWindow, RedrawReappliesAfterQuietTimeWithTheTrayFree)
 {
     ASSERT_NO_FATAL_FAILURE(Start(SIM_WINDOWS_98, 1));
     ASSERT_EQ(0, PlaceMainWindow(stand_in)) << "the first redraw put it at its spot";
@@ -245,7 +245,7 @@ TEST_F(Tray, RedrawReappliesAfterQuietTimeWithTheTrayFree)
     }
 }
 
-TEST_F(Tray, DisplayChangeRereadsTheModesButOnNTInPlace)
+TEST_F(MainWindow, DisplayChangeRereadsTheModesButOnNTInPlace)
 {
     // On NT in place the next redraw re-applies at once; the marker is the program's own mode change.
     static const struct { int windows; bool marker, off_spot, reread, at_once; } cases[] = {
@@ -266,7 +266,7 @@ TEST_F(Tray, DisplayChangeRereadsTheModesButOnNTInPlace)
 
 // Created, the window parks at its spot, shows the icon, then starts the power timers and uses up "/A"; a new
 // taskbar gets the icon again; destroyed, it stops the timers while the icon is there, and ends with 0.
-TEST_F(Tray, IconLivesFromCreationToDestructionOfTheMainWindow)
+TEST_F(MainWindow, IconLivesFromCreationToDestruction)
 {
     BootMachine(Machine(SIM_WINDOWS_98, {Card(0x5333, 0x8901)}));
     startup_flags = STARTUP_AUTORUN, keep_hook = RecordKeepCall;
@@ -291,7 +291,7 @@ TEST_F(Tray, IconLivesFromCreationToDestructionOfTheMainWindow)
 
 // A click asks for the menu, which opens from the queue once the shell's notification has returned;
 // WM_CANCELMODE takes it away, and it comes back at the same place, once.
-TEST_F(Tray, ClickOpensTheMenuFromTheQueueAndAgainAfterCancelMode)
+TEST_F(MainWindow, ClickOpensTheMenuFromTheQueueAndAgainAfterCancelMode)
 {
     ASSERT_NO_FATAL_FAILURE(Start(SIM_WINDOWS_98, 1));
     SetCursorPos(300, 200);
@@ -305,13 +305,13 @@ TEST_F(Tray, ClickOpensTheMenuFromTheQueueAndAgainAfterCancelMode)
 }
 
 // The power entries wait for the menu to go (dispatching what waited) and end the timers for the Monitor page.
-TEST_F(Tray, CommandsStartTheirProgramsOpenTheirAdaptersSheetOrEnterAPowerState)
+TEST_F(MainWindow, CommandsStartTheirProgramsOpenTheirAdaptersSheetOrEnterAPowerState)
 {
     const struct { int cards; UINT command; int handled; std::string seen; } rows[] = {
         {1, 201, 1, "Control.exe desk.cpl @0,3"}, {1, 204, 1, "Control.exe desk.cpl @0,0"},
         {1, 205, 1, "Control.exe desk.cpl @0,1"}, {1, 206, 1, "Control.exe desk.cpl @0,2"},
         {1, 202, 1, "dxprobe.exe"}, {1, 210, 1, "loupe.exe \"Zoom In\" X:\\T.INI"},
-        {2, 210, 1, "loupe.exe \"Zoom In\" X:\\T.INI 2"}, {1, 209, 1, "dialog Vistrel, default 7"} /* to close */,
+        {2, 210, 1, "loupe.exe \"Zoom In\" X:\\T.INI 2"}, {1, 209, 1, "dialog Vistrel, default 7"} /* No (7) */,
         {1, 207, 0, ""}, {1, 208, 1, ""}, {1, 203, 1, ""} /* no entry 203: no title, no panning dialog */,
         {1, 200, 0, ""}, {1, 214, 0, ""}, {1, 211, 1, "dxprobe.exe; keep 1 1 0"},
         {1, 212, 1, "dxprobe.exe; keep 2 1 0"}, {1, 213, 1, "dxprobe.exe; keep 4 1 0"},
