@@ -133,7 +133,7 @@ protected:
         stand_in = main_window = CreateWindowExA(WS_EX_TOOLWINDOW, "TrayStandIn", "", WS_POPUP | WS_VISIBLE, 0, 0, 1, 1,
                                                  NULL, NULL, instance, NULL);
         run_program = RecordStart, keep_hook = RecordKeepCall, on_dialog = SeeAndCancel;
-        seen.clear(), menus_at.clear();
+        seen.clear(), menus_at.clear(), last_activity_tick = 0;
     }
 };
 
@@ -185,7 +185,7 @@ TEST_F(MainWindow, MenuIconsAndDrawingKeepNoGdiObject)
     MEASUREITEMSTRUCT measure = {ODT_MENU, 0, MENU_CLOSE, 0, 0, close};
     SendMessageA(stand_in, WM_MEASUREITEM, 0, (LPARAM)&measure);
     HDC dc = CreateCompatibleDC(NULL);
-    SIZE text;
+    SIZE text = {};
     GetTextExtentPoint32A(dc, "Close", 5, &text);
     EXPECT_TRUE(measure.itemWidth == text.cx + 39u && measure.itemHeight == std::max(text.cy, 32L) + 4u)
         << measure.itemWidth << "x" << measure.itemHeight;
@@ -194,18 +194,19 @@ TEST_F(MainWindow, MenuIconsAndDrawingKeepNoGdiObject)
     HGDIOBJ old_bitmap = SelectObject(dc, CreateDIBSection(dc, &bi, DIB_RGB_COLORS, (void**)&bits, NULL, 0));
     const HGDIOBJ own_brush = GetCurrentObject(dc, OBJ_BRUSH);
     const COLORREF junk = RGB(1, 2, 3), menu = GetSysColor(COLOR_MENU), lit = GetSysColor(COLOR_ACTIVECAPTION);
-    MenuItemRecord stranger = {"Stranger", NULL};  // none of the menu's records
-    const struct { UINT action, state; ULONG_PTR data; COLORREF background; } rows[] = {
-        {ODA_DRAWENTIRE, ODS_SELECTED, close, menu}, {ODA_SELECT, ODS_SELECTED, close, lit},
-        {ODA_SELECT, 0, close, menu}, {ODA_FOCUS, ODS_FOCUS, close, lit},
-        {ODA_DRAWENTIRE, 0, (ULONG_PTR)&stranger, junk}};
+    const COLORREF ink = GetSysColor(COLOR_MENUTEXT), lit_ink = GetSysColor(COLOR_HIGHLIGHTTEXT);
+    MenuItemRecord stranger = {"Stranger", NULL};  // none of the menu's records: nothing drawn, nothing set
+    const struct { UINT action, state; ULONG_PTR data; COLORREF background, text; } rows[] = {
+        {ODA_DRAWENTIRE, ODS_SELECTED, close, menu, ink}, {ODA_SELECT, ODS_SELECTED, close, lit, lit_ink},
+        {ODA_SELECT, 0, close, menu, ink}, {ODA_FOCUS, ODS_FOCUS, close, lit, lit_ink},
+        {ODA_DRAWENTIRE, 0, (ULONG_PTR)&stranger, junk, lit_ink}};
     for (int i = 0; i < 100; ++i) {  // and again, for a leak to add up
         const auto& row = rows[i % 5];
         std::fill(bits, bits + 200 * 40, 0x010203u);
         DRAWITEMSTRUCT draw = {ODT_MENU, 0, MENU_CLOSE, row.action, row.state, NULL, dc, {10, 2, 150, 38}, row.data};
         SendMessageA(stand_in, WM_DRAWITEM, 0, (LPARAM)&draw);
         ASSERT_TRUE(GetPixel(dc, 149, 37) == row.background && GetPixel(dc, 150, 38) == junk &&
-                    GetCurrentObject(dc, OBJ_BRUSH) == own_brush) << "row " << i % 5;
+                    GetTextColor(dc) == row.text && GetCurrentObject(dc, OBJ_BRUSH) == own_brush) << "row " << i % 5;
     }
     DeleteObject(SelectObject(dc, old_bitmap));
     DeleteDC(dc);
@@ -214,9 +215,9 @@ TEST_F(MainWindow, MenuIconsAndDrawingKeepNoGdiObject)
 
 TEST(TaskbarCorner, MainWindowSpotIsTheCornerAtTheFarEndOfTheTaskbar)
 {
-    static const struct { RECT taskbar; LONG x, y; } cases[] = {
-        {{0, 740, 1024, 768}, 1023, 767}, {{994, 0, 1024, 768}, 1023, 767},  // bottom, right
-        {{0, 0, 30, 768}, 0, 767}, {{-2, -2, 1026, 28}, 1023, 0}};           // left, top
+    static const struct { RECT taskbar; LONG x, y; } cases[] = {  // bottom, right, left, top, off both edges
+        {{0, 740, 1024, 768}, 1023, 767}, {{994, 0, 1024, 768}, 1023, 767}, {{0, 0, 30, 768}, 0, 767},
+        {{-2, -2, 1026, 28}, 1023, 0}, {{1, 0, 1024, 28}, 1023, 767}, {{0, 1, 30, 768}, 1023, 767}};
     for (const auto& c : cases) {
         TaskbarPlace place = {1024, 768, c.taskbar};
         EXPECT_TRUE(MainWindowSpot(&place).x == c.x && MainWindowSpot(&place).y == c.y) << &c - cases;
@@ -325,7 +326,6 @@ TEST_F(MainWindow, CommandsStartTheirProgramsOpenTheirAdaptersSheetOrEnterAPower
         for (int setting : {SETTING_STANDBY, SETTING_SUSPEND, SETTING_SHUTOFF}) SaveSetting(setting, 5);
         if (power) PostMessageA(stand_in, WM_COMMAND, MENU_DIRECTX_INFO, 0);
         const DWORD start = GetTickCount();
-        last_activity_tick = 0;
         EXPECT_EQ(row.handled, OnMenuCommand(stand_in, row.command));
         EXPECT_EQ(row.seen, seen);
         EXPECT_TRUE(shell_state == 0 && last_activity_tick != 0 && (!row.seen.empty() || current_adapter == 0));
