@@ -12,6 +12,7 @@
 #include "base/state.h"
 #include "base/texts.h"
 #include "hardware/driver_key.h"
+#include "modes/mode_list.h"
 #include "pages/desktop_steps.h"
 #include "pages/sheet_driver.h"
 #include "support/machine.h"
@@ -152,6 +153,7 @@ TEST_F(DesktopPageTest, SlidersWalkTheModeTable)
                       Shown(sheet));
         },
     });
+    EXPECT_EQ(nullptr, mode_table) << "the table goes with the page";
 }
 
 TEST_F(DesktopPageTest, TitleNamesTheDriverElseTheProduct)
