@@ -14,7 +14,7 @@
 #include "hardware/driver_key.h"
 #include "modes/mode_list.h"
 #include "pages/desktop_steps.h"
-#include "pages/sheet_driver.h"
+#include "pages/sheet.h"
 #include "support/machine.h"
 #include "support/support.h"
 
@@ -93,14 +93,22 @@ protected:
 
 void Slide(HWND sheet, int id, int code, int thumb = 0)
 {
-    HWND page = CurrentPage(sheet);
+    HWND page = Page(sheet);
     SendMessageA(page, WM_HSCROLL, MAKEWPARAM(code, thumb), (LPARAM)GetDlgItem(page, id));
+}
+
+std::string ControlText(HWND page, int id)
+{
+    char text[128];
+    memset(text, '#', sizeof text);
+    GetDlgItemTextA(page, id, text, sizeof text);
+    return text;
 }
 
 // Each slider's label, position and last position (the font's: its dpi).
 std::string Shown(HWND sheet)
 {
-    HWND page = CurrentPage(sheet);
+    HWND page = Page(sheet);
     std::string shown;
     for (int id : {IDC_DESKTOP_RES_SLIDER, IDC_DESKTOP_COLOUR_SLIDER, IDC_DESKTOP_FONT_SLIDER,
                    IDC_DESKTOP_REFRESH_SLIDER}) {
@@ -124,12 +132,11 @@ TEST_F(DesktopPageTest, SlidersWalkTheModeTable)
     SimSetModeList(modes, sizeof modes / sizeof modes[0]);
     AdapterRecord* a = CurrentAdapter();
     a->width = 800, a->height = 600, a->bits_per_pixel = 8, a->refresh_hz = 85;
-    RunSheet(PAGE_DESKTOP, {
-        [](HWND sheet) {
+    EXPECT_TRUE(RunSheet(PAGE_DESKTOP, [](HWND sheet) {
             const char* small = "96dpi (Small Fonts) @96/192";
             EXPECT_EQ(std::string(" 800 x 600 @1/3 | 256 Color (8 bit) @0/1 | ") + small + " | 85 Hz @4/4", Shown(sheet));
             Slide(sheet, IDC_DESKTOP_FONT_SLIDER, TB_PAGEDOWN);
-            EXPECT_TRUE(ApplyEnabled(sheet));
+            EXPECT_TRUE(Enabled(sheet, apply_button));
             // A larger mode asks 10 Hz less, and the font follows the screen's again.
             Slide(sheet, IDC_DESKTOP_RES_SLIDER, TB_LINEDOWN);
             EXPECT_EQ(std::string("1024 x 768 @2/3 | 256 Color (8 bit) @0/0 | ") + small + " | 75 Hz @3/4", Shown(sheet));
@@ -147,8 +154,7 @@ TEST_F(DesktopPageTest, SlidersWalkTheModeTable)
             Slide(sheet, IDC_DESKTOP_RES_SLIDER, TB_THUMBPOSITION, 3);
             EXPECT_EQ(std::string("1280 x 1024 @3/3 | 256 Color (8 bit) @0/0 | ") + small + " | BIOS Default @0/0",
                       Shown(sheet));
-        },
-    });
+    }));
     EXPECT_EQ(nullptr, mode_table) << "the table goes with the page";
 }
 
@@ -180,9 +186,9 @@ TEST_F(DesktopPageTest, TitleNamesTheDriverElseTheProduct)
         ASSERT_EQ(ERROR_SUCCESS, RegOpenKeyExA(HKEY_LOCAL_MACHINE, key, 0, KEY_SET_VALUE, &driver));
         if (!c.description) RegDeleteValueA(driver, name);
         RegCloseKey(driver);
-        RunSheet(PAGE_DESKTOP, {[&](HWND sheet) {
-            EXPECT_EQ(c.title, ControlText(CurrentPage(sheet), IDC_DESKTOP_TITLE)) << c.windows;
-        }});
+        EXPECT_TRUE(RunSheet(PAGE_DESKTOP, [&](HWND sheet) {
+            EXPECT_EQ(c.title, ControlText(Page(sheet), IDC_DESKTOP_TITLE)) << c.windows;
+        }));
     }
 }
 
@@ -199,29 +205,23 @@ TEST_F(DesktopPageTest, ApplyChangesTheCardAndACancelledModeComesBack)
     ASSERT_NO_FATAL_FAILURE(BootDefaultAndDetect());
     ASSERT_EQ(768, VisibleLines());
     std::string before;
-    RunSheet(PAGE_DESKTOP, {
-        [&](HWND sheet) {
+    EXPECT_TRUE(RunSheet(PAGE_DESKTOP, [&](HWND sheet) {
             Slide(sheet, IDC_DESKTOP_RES_SLIDER, TB_LINEUP);
             before = Shown(sheet);
             DialogAnswerer keep(IDOK);
-            PressSheetButton(sheet, PSBTN_APPLYNOW);
+            Apply(sheet);
             EXPECT_EQ(1, keep.answered);
-        },
-        [&](HWND sheet) {
             EXPECT_EQ(600, VisibleLines());
             EXPECT_EQ(800, SimGetCardMode(0).width);
-            EXPECT_FALSE(ApplyEnabled(sheet));
+            EXPECT_FALSE(Enabled(sheet, apply_button));
             Slide(sheet, IDC_DESKTOP_RES_SLIDER, TB_TOP);
             EXPECT_NE(before, Shown(sheet));
             DialogAnswerer refuse(IDCANCEL);
-            PressSheetButton(sheet, PSBTN_APPLYNOW);
+            Apply(sheet);
             EXPECT_EQ(1, refuse.answered);
-        },
-        [&](HWND sheet) {
             EXPECT_EQ(600, VisibleLines());
             EXPECT_EQ(before, Shown(sheet));
-        },
-    });
+    }));
 }
 
 }  // namespace

@@ -23,17 +23,16 @@
 #include "pages/edid.h"
 #include "pages/monitor_info.h"
 #include "pages/property_sheet.h"
+#include "pages/sheet.h"
 #include "support/machine.h"
 
-namespace {
-
-std::function<void(HWND sheet)> step;
-int seen;  // timer ticks that found the sheet
-bool busy;
+static std::function<void(HWND sheet)> step;
+static int seen;  // timer ticks that found the sheet
+static bool busy;
 
 // WM_TIMER comes only when no posted message waits: the step finds the sheet
 // settled. The next tick cancels the sheet.
-void CALLBACK Tick(HWND, UINT, UINT_PTR, DWORD)
+static void CALLBACK Tick(HWND, UINT, UINT_PTR, DWORD)
 {
     HWND sheet = GetActiveWindow();
     if (busy || !sheet || !PropSheet_GetTabControl(sheet)) return;
@@ -65,6 +64,8 @@ void Apply(HWND sheet)
     PropSheet_PressButton(sheet, PSBTN_APPLYNOW);
     for (MSG message; PeekMessageA(&message, NULL, 0, 0, PM_REMOVE);) DispatchMessageA(&message);
 }
+
+namespace {
 
 // A chip family hiding the pages of hidden_pages (bit n: page n), its memory clock up to mclk_max.
 unsigned hidden_pages;
