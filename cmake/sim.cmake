@@ -44,6 +44,7 @@ set_target_properties(simstate PROPERTIES RUNTIME_OUTPUT_DIRECTORY ${SIM_DIR})
 
 # What building a long mode table costs (a benchmark, not a timed test).
 add_executable(bench-modetable ${VISTREL_ROOT}/tools/bench/bench_modetable.cpp)
+target_include_directories(bench-modetable PRIVATE ${VISTREL_ROOT}/tests)
 target_link_libraries(bench-modetable PRIVATE vistrel_core vistrel_sim)
 target_link_options(bench-modetable PRIVATE ${VISTREL_STATIC_RUNTIME})
 set_target_properties(bench-modetable PROPERTIES RUNTIME_OUTPUT_DIRECTORY ${SIM_DIR})

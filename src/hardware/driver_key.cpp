@@ -5,6 +5,7 @@
 #include <windows.h>
 
 #include "base/adapters.h"
+#include "base/module_reset.h"
 #include "base/runtime.h"
 #include "base/state.h"
 #include "hardware/registry_text.h"
@@ -92,13 +93,48 @@ int ReadDeviceNodeValue(const char* name, uint32_t* out)
     return r == ERROR_SUCCESS ? 1 : 0;
 }
 
-int DriverKeyValue(const char* subkey, const char* name, void* buffer, uint32_t size, uint32_t type, int read)
+// The driver key found and opened once while many of its values are read;
+// finding it on 9x walks every device node.
+static HKEY held_key;
+static size_t held_path_length;
+
+int HoldDriverKey()
 {
+    ReleaseDriverKey();
     char path[KEY_PATH_SIZE];
     if (FindDriverKey(path) != 1) return -1;
-    if (!AppendText(path, sizeof path, subkey)) return -1;
+    held_path_length = TextLength(path);
+    if (RegOpenKeyExA(HKEY_LOCAL_MACHINE, path, 0, KEY_READ, &held_key) == ERROR_SUCCESS) return 1;
+    held_key = NULL;
+    return -1;
+}
+
+void ReleaseDriverKey()
+{
+    if (held_key) RegCloseKey(held_key);
+    held_key = NULL;
+}
+VISTREL_MODULE_RESET(ReleaseDriverKey);
+
+static LONG OpenDriverSubkey(const char* subkey, int read, HKEY* key)
+{
+    if (read && held_key) {
+        // The same paths as without the held key, and none longer.
+        if (held_path_length + TextLength(subkey) >= KEY_PATH_SIZE) return ERROR_BAD_PATHNAME;
+        // A path below an open key must not begin at a backslash.
+        while (*subkey == '\\') ++subkey;
+        return RegOpenKeyExA(held_key, subkey, 0, KEY_READ, key);
+    }
+    char path[KEY_PATH_SIZE];
+    if (FindDriverKey(path) != 1) return ERROR_FILE_NOT_FOUND;
+    if (!AppendText(path, sizeof path, subkey)) return ERROR_BAD_PATHNAME;
+    return RegOpenKeyExA(HKEY_LOCAL_MACHINE, path, 0, read ? KEY_READ : KEY_WRITE, key);
+}
+
+int DriverKeyValue(const char* subkey, const char* name, void* buffer, uint32_t size, uint32_t type, int read)
+{
     HKEY key;
-    if (RegOpenKeyExA(HKEY_LOCAL_MACHINE, path, 0, read ? KEY_READ : KEY_WRITE, &key) != ERROR_SUCCESS) return -1;
+    if (OpenDriverSubkey(subkey, read, &key) != ERROR_SUCCESS) return -1;
     LONG r;
     if (read) {
         DWORD length = size;

@@ -14,6 +14,10 @@ int ReadDeviceNodeValue(const char* name, uint32_t* out);
 // Reads (read = 1) or writes a value of the display driver key with the
 // subkey text appended. 1, or -1 on any failure.
 int DriverKeyValue(const char* subkey, const char* name, void* buffer, uint32_t size, uint32_t type, int read);
+// Opens the driver key once so that the reads of DriverKeyValue until
+// ReleaseDriverKey skip finding it again: 1, or -1 (reads then find it).
+int HoldDriverKey();
+void ReleaseDriverKey();
 // The display driver's file: NT "imagepath" of its service, 9x "drv".
 int DriverImageName(char* out);
 // NT: the primary display's depth from its service key, telling 15 from 16.

@@ -312,6 +312,8 @@ int BuildModeTable(int include_15bit)
     TableBuild build = {include_15bit, 0};
     ForEachListedMode(CollectMode, &build);
     SortModeTable(build.count);
+    // Every 9x mode's rate list lies below the same driver key.
+    if (platform != PLATFORM_NT) HoldDriverKey();
     for (int i = 0; i < build.count; ++i) {
         ModeEntry* e = &mode_table[i];
         ModeKey mode = {e->width, e->height, e->bits_per_pixel};
@@ -319,5 +321,6 @@ int BuildModeTable(int include_15bit)
         int count = ReadCombinedList(&mode, rates, LIST_WALK_LIMIT);
         for (int k = 0; k < count && k < MODE_RATES; ++k) InsertRate(e->rates, MODE_RATES, rates[k]);
     }
+    ReleaseDriverKey();
     return 1;
 }

@@ -10,6 +10,7 @@
 #include "modes/rate_list.h"
 #include "shell/main_window.h"
 #include "support/machine.h"
+#include "support/registry_opens.h"
 #include "support/support.h"
 
 static std::vector<int> Parse(const std::string& text)
@@ -124,7 +125,14 @@ TEST(ModeList, AHundredModesFillTheTableAndEndTheEnumeration)
         modes[i] = SimListedMode{(uint16_t)(i < 100 ? 640 + 8 * (99 - i) : 600), 480, 8, 1, {60}};
     SimSetModeList(modes, 120);
     ForgetDisplaySettings();
+    ASSERT_TRUE(CountRegistryOpens());
+    char text[RATE_LIST_TEXT_SIZE];
+    registry_opens = 0;
+    ModeKeyRates(640, 480, 8, text, sizeof text);
+    const unsigned one_mode = registry_opens;  // finding the driver key, then the mode's key
+    registry_opens = 0;
     BuildModeTable(0);
+    EXPECT_LE(registry_opens, MODE_TABLE_SIZE + one_mode) << "the driver key found once, each mode's key opened once";
     int entries = 0;
     while (entries < MODE_TABLE_SIZE && mode_table[entries].bits_per_pixel) ++entries;
     EXPECT_EQ(MODE_TABLE_SIZE, entries);

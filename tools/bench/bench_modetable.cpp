@@ -17,43 +17,9 @@
 #include "modes/mode_list.h"
 #include "modes/rate_list.h"
 #include "sim.h"
+#include "support/registry_opens.h"
 
 enum { BENCH_MODES = 100, BENCH_RATES = 10 };
-
-static unsigned registry_opens;
-static LONG(WINAPI* real_RegOpenKeyExA)(HKEY, LPCSTR, DWORD, REGSAM, PHKEY);
-
-static LONG WINAPI CountingRegOpenKeyExA(HKEY root, LPCSTR path, DWORD options, REGSAM access, PHKEY key)
-{
-    ++registry_opens;
-    return real_RegOpenKeyExA(root, path, options, access, key);
-}
-
-// Points this program's import of RegOpenKeyExA at the counter: the program's
-// registry code calls through the same import slot.
-static bool CountRegistryOpens()
-{
-    BYTE* image = (BYTE*)GetModuleHandleA(NULL);
-    IMAGE_NT_HEADERS* nt = (IMAGE_NT_HEADERS*)(image + ((IMAGE_DOS_HEADER*)image)->e_lfanew);
-    IMAGE_DATA_DIRECTORY dir = nt->OptionalHeader.DataDirectory[IMAGE_DIRECTORY_ENTRY_IMPORT];
-    for (IMAGE_IMPORT_DESCRIPTOR* d = (IMAGE_IMPORT_DESCRIPTOR*)(image + dir.VirtualAddress); d->Name; ++d) {
-        if (lstrcmpiA((const char*)(image + d->Name), "ADVAPI32.dll") != 0) continue;
-        IMAGE_THUNK_DATA* names = (IMAGE_THUNK_DATA*)(image + d->OriginalFirstThunk);
-        IMAGE_THUNK_DATA* slots = (IMAGE_THUNK_DATA*)(image + d->FirstThunk);
-        for (; names->u1.AddressOfData; ++names, ++slots) {
-            if (IMAGE_SNAP_BY_ORDINAL(names->u1.Ordinal)) continue;
-            IMAGE_IMPORT_BY_NAME* name = (IMAGE_IMPORT_BY_NAME*)(image + names->u1.AddressOfData);
-            if (strcmp((const char*)name->Name, "RegOpenKeyExA") != 0) continue;
-            DWORD old;
-            VirtualProtect(&slots->u1.Function, sizeof slots->u1.Function, PAGE_READWRITE, &old);
-            real_RegOpenKeyExA = (LONG(WINAPI*)(HKEY, LPCSTR, DWORD, REGSAM, PHKEY))slots->u1.Function;
-            slots->u1.Function = (ULONG_PTR)CountingRegOpenKeyExA;
-            VirtualProtect(&slots->u1.Function, sizeof slots->u1.Function, old, &old);
-            return true;
-        }
-    }
-    return false;
-}
 
 // 100 modes, each with rates from 56 Hz up in 6 Hz steps.
 static int MakeModes(SimListedMode* modes)
