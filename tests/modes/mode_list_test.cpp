@@ -133,6 +133,9 @@ TEST(ModeList, AHundredModesFillTheTableAndEndTheEnumeration)
     registry_opens = 0;
     BuildModeTable(0);
     EXPECT_LE(registry_opens, MODE_TABLE_SIZE + one_mode) << "the driver key found once, each mode's key opened once";
+    registry_opens = 0;
+    ModeKeyRates(640, 480, 8, text, sizeof text);
+    EXPECT_EQ(one_mode, registry_opens) << "a key held past the table would be the wrong adapter's after a switch";
     int entries = 0;
     while (entries < MODE_TABLE_SIZE && mode_table[entries].bits_per_pixel) ++entries;
     EXPECT_EQ(MODE_TABLE_SIZE, entries);
