@@ -1,10 +1,8 @@
-// The Desktop page: how its sliders step, and the page in the real sheet from the
-// simulated machine's mode table to the card's registers.
+// The Desktop page: how its sliders step, and the real sheet from the simulated mode table to the card.
 #include <gtest/gtest.h>
 #include <windows.h>
 
 #include <commctrl.h>
-#include <prsht.h>
 
 #include "base/adapters.h"
 #include "base/module_reset.h"
@@ -66,9 +64,7 @@ TEST(DesktopSteps, AboveVgaLinesTheFontFollowsTheScreen)
     }
 }
 
-struct DesktopPageTest : ::testing::Test {
-    void TearDown() override { ResetAllModules(); }
-};
+struct DesktopPageTest : ::testing::Test { void TearDown() override { ResetAllModules(); } };
 
 void Slide(HWND sheet, int id, int code, int thumb = 0)
 {
@@ -98,9 +94,8 @@ TEST_F(DesktopPageTest, SlidersWalkTheModeTable)
 {
     ASSERT_NO_FATAL_FAILURE(BootDefaultAndDetect());
     static const SimListedMode modes[] = {
-        {640, 480, 8, 4, {60, 72, 75, 85}},    {800, 600, 8, 5, {56, 60, 72, 76, 85}},
-        {800, 600, 16, 1, {60}},               {1024, 768, 8, 5, {60, 70, 72, 75, 85}},
-        {1280, 1024, 8, 0, {}},
+        {640, 480, 8, 4, {60, 72, 75, 85}}, {800, 600, 8, 5, {56, 60, 72, 76, 85}}, {800, 600, 16, 1, {60}},
+        {1024, 768, 8, 5, {60, 70, 72, 75, 85}}, {1280, 1024, 8, 0, {}},
     };
     SimSetModeList(modes, sizeof modes / sizeof modes[0]);
     AdapterRecord* a = CurrentAdapter();

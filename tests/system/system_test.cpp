@@ -17,6 +17,7 @@
 // The numbers other programs send; they never change.
 static const UINT msg_query_refresh = 1126, msg_get_refresh = 1127, msg_set_refresh = 1128;
 static const char card_key[] = "SOFTWARE\\QUORVEL\\PANEL\\53338901";
+static const int monitor_list_id = 1039, close_command = 209;
 
 static std::string MachineIni(const std::string& windows, const std::string& card = "5333:8901")
 {
@@ -52,13 +53,17 @@ struct Panel {
         WriteRegistryString(HKEY_CURRENT_USER, "Software\\Wine\\AppDefaults\\vistrel-sim.exe", "Version", version);
         return process.Start("\"" + folder + "vistrel-sim.exe\" " + arguments, folder);
     }
-    // The main window once its icon is in the taskbar, after the start-up's work.
+    // The main window, a hidden 1 x 1 tool window, once its icon is in the taskbar after the start-up's work.
     HWND WaitWindow()
     {
         DWORD_PTR r;
+        RECT box;
         for (DWORD start = GetTickCount(); GetTickCount() - start < 30000 && process.WaitExit(20) == -1;) {
             HWND w = FindWindowA("zentra", NULL);
-            if (w && SendMessageTimeoutA(w, WM_NULL, 0, 0, SMTO_NORMAL, 30000, &r) && IconShown(w)) return w;
+            if (w && SendMessageTimeoutA(w, WM_NULL, 0, 0, SMTO_NORMAL, 30000, &r) && IconShown(w) &&
+                GetWindowRect(w, &box) && box.right - box.left == 1 && box.bottom - box.top == 1 &&
+                (GetWindowLongA(w, GWL_EXSTYLE) & WS_EX_TOOLWINDOW))
+                return w;
         }
         return NULL;
     }
@@ -76,8 +81,8 @@ struct Panel {
     LRESULT Send(UINT message, WPARAM wparam, LPARAM lparam = 0)
     {
         DWORD_PTR result = 0;
-        HWND w = FindWindowA("zentra", NULL);
-        return w && SendMessageTimeoutA(w, message, wparam, lparam, SMTO_NORMAL, 20000, &result) ? result : -12345;
+        HWND w = FindWindowA("zentra", NULL);  // none: the call fails
+        return SendMessageTimeoutA(w, message, wparam, lparam, SMTO_NORMAL, 20000, &result) ? result : -12345;
     }
     // A value of simstate.exe's report, e.g. ("Card0", "RefreshHz").
     std::string State(const char* section, const char* key)
@@ -109,7 +114,6 @@ struct Panel {
         int extended = os.empty() ? 0 : os.back() + 15;
         WritePrivateProfileStringA(section, Name(m).c_str(), std::to_string(extended).c_str(),
                                    (folder + "ZNTR3.INI").c_str());
-        EXPECT_GT(extended, 15);
         EXPECT_EQ(1, Send(msg_set_refresh, extended));
         EXPECT_NEAR(extended, RefreshHz(), 2.0);
         EXPECT_EQ(extended, (int)Send(msg_get_refresh, 0));
@@ -125,29 +129,17 @@ struct SystemTest : ::testing::Test {
     void TearDown() override { ClearSettingsStore(); }
 };
 
-// The running copy is a hidden 1 x 1 tool window.
-static void ExpectHidden(HWND w)
-{
-    RECT r;
-    ASSERT_TRUE(w && GetWindowRect(w, &r));
-    EXPECT_EQ(1 * 1000 + 1, (r.right - r.left) * 1000 + r.bottom - r.top);
-    EXPECT_TRUE(GetWindowLongA(w, GWL_EXSTYLE) & WS_EX_TOOLWINDOW);
-}
-
 // Texts of another process's windows: only the wide forms cross processes intact.
 static std::string Narrow(const wchar_t* text) { return std::string(text, text + lstrlenW(text)) + "\n"; }
-
-static const int monitor_list_id = 1039, close_command = 209;
 
 TEST_F(SystemTest, OnWindows98)
 {
     Panel panel(MachineIni("98"));
     ASSERT_TRUE(panel.Start("win98"));
     HWND w = panel.WaitWindow();
-    ASSERT_NO_FATAL_FAILURE(ExpectHidden(w));
+    ASSERT_TRUE(w);
 
-    // A second start opens this copy's menu and ends; keys posted to the menu
-    // as the keyboard would: Desktop, Information, Monitor.
+    // A second start opens this copy's menu and ends; keys as the keyboard: Desktop, Information, Monitor.
     ChildProcess second;
     ASSERT_TRUE(second.Start("\"" + panel.folder + "vistrel-sim.exe\"", panel.folder));
     EXPECT_EQ(0, second.WaitExit(30000));
@@ -178,7 +170,6 @@ TEST_F(SystemTest, OnWindows98)
     ASSERT_FALSE(modes.empty());
     EXPECT_EQ(0u, offered.find(modes)) << offered << " does not start with the MODES list " << modes;
     EXPECT_NEAR(panel.RefreshHz(), (double)panel.Send(msg_get_refresh, 0), 1.0);
-
     LRESULT before = panel.Send(msg_get_refresh, 0);
     std::string clock = panel.State("Card0", "PixelClockHz");
     for (WPARAM rate : {65535, 400, 2, 0}) EXPECT_EQ(0, panel.Send(msg_set_refresh, rate)) << rate;
@@ -193,8 +184,7 @@ TEST_F(SystemTest, OnWindows98)
     WriteRegistryString(HKEY_LOCAL_MACHINE, card_key, Name(mode) + "x" + std::to_string(extended) + "H",
                         std::to_string(position), false);
 
-    // Another program changes the mode and back: the driver runs its own rate
-    // until the first redraw after three quiet seconds of the program's clock.
+    // Another program changes the mode and back: the driver's own rate until a redraw after three quiet seconds.
     other.dmPelsWidth = 800, other.dmPelsHeight = 600;
     ChangeDisplaySettingsA(&other, 0);
     ChangeDisplaySettingsA(&mode, 0);
@@ -229,7 +219,7 @@ TEST_F(SystemTest, OnWindowsNTTheExtendedRateComesFromThePixelClock)
 {
     Panel panel(MachineIni("NT4"));
     ASSERT_TRUE(panel.Start("nt40"));
-    ASSERT_NO_FATAL_FAILURE(ExpectHidden(panel.WaitWindow()));
+    ASSERT_TRUE(panel.WaitWindow());
     EXPECT_NEAR(panel.RefreshHz(), (double)panel.Send(msg_get_refresh, 0), 1.0);
     panel.SetExtendedRate("CHIP8901_NT4E");
 }
