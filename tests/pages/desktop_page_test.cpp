@@ -1,10 +1,8 @@
-// The Desktop page: how its sliders step, and the page in the real sheet on
-// the simulated machine, from the mode table to the card's registers.
+// The Desktop page: how its sliders step, and the real sheet from the simulated mode table to the card.
 #include <gtest/gtest.h>
 #include <windows.h>
 
 #include <commctrl.h>
-#include <prsht.h>
 
 #include "base/adapters.h"
 #include "base/module_reset.h"
@@ -22,30 +20,19 @@ namespace {
 
 TEST(DesktopSteps, SlidersStayInRangeAndTheFontKeepsToItsGrid)
 {
-    static const struct {
-        int code, thumb, position, maximum;
-        bool settle;
-        int target;
-    } slides[] = {
-        {TB_LINEUP, 0, 0, 3, false, -1},        {TB_PAGEUP, 0, 2, 3, false, 1},
-        {TB_LINEDOWN, 0, 3, 3, false, -1},      {TB_PAGEDOWN, 0, 2, 3, false, 3},
-        {TB_THUMBTRACK, 1, 3, 3, true, 1},      {TB_THUMBTRACK, 3, 3, 3, true, -1},
-        {TB_THUMBPOSITION, 3, 3, 3, false, -1}, {TB_THUMBPOSITION, 3, 3, 3, true, 3},
-        {TB_THUMBPOSITION, 9, 1, 3, true, 3},   {TB_TOP, 0, 2, 3, false, 0},
-        {TB_TOP, 0, 0, 3, false, -1},           {TB_BOTTOM, 0, 1, 3, false, 3},
-        {TB_ENDTRACK, 0, 1, 3, true, -1},
+    static const struct { int code, thumb, position, maximum, settle, target; } slides[] = {
+        {TB_LINEUP, 0, 2, 3, 0, 1},           {TB_PAGEUP, 0, 0, 3, 0, -1},         {TB_LINEDOWN, 0, 3, 3, 0, -1},
+        {TB_PAGEDOWN, 0, 2, 3, 0, 3},         {TB_THUMBTRACK, 1, 3, 3, 1, 1},      {TB_THUMBTRACK, 3, 3, 3, 1, -1},
+        {TB_THUMBPOSITION, 3, 3, 3, 0, -1},   {TB_THUMBPOSITION, 3, 3, 3, 1, 3},   {TB_THUMBPOSITION, 9, 1, 3, 1, 3},
+        {TB_TOP, 0, 2, 3, 0, 0},              {TB_BOTTOM, 0, 1, 3, 0, 3},          {TB_ENDTRACK, 0, 1, 3, 1, -1},
     };
     for (const auto& s : slides)
-        EXPECT_EQ(s.target, SliderTarget(s.code, s.thumb, s.position, s.maximum, s.settle))
+        EXPECT_EQ(s.target, SliderTarget(s.code, s.thumb, s.position, s.maximum, s.settle != 0))
             << s.code << " " << s.thumb << " from " << s.position << " settle " << s.settle;
-    static const struct {
-        int code, thumb, dpi, target;
-    } fonts[] = {
-        {TB_PAGEUP, 0, 100, 96},      {TB_PAGEUP, 0, 96, 72},       {TB_PAGEUP, 0, 72, -1},
-        {TB_PAGEDOWN, 0, 100, 120},   {TB_PAGEDOWN, 0, 180, 192},   {TB_PAGEDOWN, 0, 192, -1},
-        {TB_LINEUP, 0, 72, -1},       {TB_LINEDOWN, 0, 191, 192},   {TB_THUMBTRACK, 200, 150, 192},
-        {TB_THUMBPOSITION, 100, 100, -1}, {TB_TOP, 0, 100, 72},     {TB_BOTTOM, 0, 100, 192},
-        {TB_ENDTRACK, 0, 100, -1},
+    static const struct { int code, thumb, dpi, target; } fonts[] = {
+        {TB_PAGEUP, 0, 100, 96},    {TB_PAGEUP, 0, 96, 72},        {TB_PAGEDOWN, 0, 100, 120}, {TB_PAGEDOWN, 0, 180, 192},
+        {TB_LINEUP, 0, 72, -1},     {TB_LINEDOWN, 0, 191, 192},    {TB_THUMBTRACK, 200, 150, 192},
+        {TB_THUMBPOSITION, 100, 100, -1}, {TB_TOP, 0, 100, 72},   {TB_BOTTOM, 0, 100, 192}, {TB_ENDTRACK, 0, 100, -1},
     };
     for (const auto& f : fonts) EXPECT_EQ(f.target, FontTarget(f.code, f.thumb, f.dpi)) << f.code << " " << f.dpi;
 }
@@ -53,13 +40,9 @@ TEST(DesktopSteps, SlidersStayInRangeAndTheFontKeepsToItsGrid)
 TEST(DesktopSteps, RefreshIsTheHighestNotAboveWantedPlusOne)
 {
     static const uint16_t rates[] = {60, 70, 72, 75, 85, 0};
-    static const struct {
-        const uint16_t* list;
-        int count, wanted, rate, position, maximum;
-    } cases[] = {
-        {rates, 6, 75, 75, 3, 4}, {rates, 6, 76, 75, 3, 4}, {rates, 6, 84, 85, 4, 4}, {rates, 6, 0, 60, 0, 4},
-        {rates, 3, 100, 72, 2, 2},  // a full list has no end mark
-        {rates, 0, 75, 0, 0, 0},    {rates + 5, 1, 75, 0, 0, 0},
+    static const struct { const uint16_t* list; int count, wanted, rate, position, maximum; } cases[] = {
+        {rates, 6, 75, 75, 3, 4}, {rates, 6, 84, 85, 4, 4}, {rates, 6, 0, 60, 0, 4}, {rates, 0, 75, 0, 0, 0},
+        {rates + 5, 1, 75, 0, 0, 0}, {rates, 3, 100, 72, 2, 2},  // a full list has no end mark
     };
     for (const auto& c : cases) {
         int position = -7, maximum = -7;
@@ -70,31 +53,22 @@ TEST(DesktopSteps, RefreshIsTheHighestNotAboveWantedPlusOne)
 
 TEST(DesktopSteps, AboveVgaLinesTheFontFollowsTheScreen)
 {
-    static const struct {
-        int height, screen_x, screen_y, dpi_x, dpi_y;
-        bool changed;
-        int x, y;
-    } cases[] = {
-        {480, 96, 96, 120, 120, false, 120, 120}, {600, 96, 96, 120, 120, true, 96, 96},
-        {600, 96, 96, 96, 96, false, 96, 96},     {600, 100, 144, 96, 96, true, 120, 120},
-        {768, 120, 96, 100, 100, true, 120, 96},
+    static const struct { int height, screen_x, screen_y, dpi_x, dpi_y, changed, x, y; } cases[] = {
+        {480, 96, 96, 120, 120, 0, 120, 120}, {600, 96, 96, 120, 120, 1, 96, 96}, {600, 96, 96, 96, 96, 0, 96, 96},
+        {600, 100, 144, 96, 96, 1, 120, 120}, {768, 120, 96, 100, 100, 1, 120, 96},
     };
     for (const auto& c : cases) {
         int x = c.dpi_x, y = c.dpi_y;
-        EXPECT_EQ(c.changed, FollowScreenFont(c.height, c.screen_x, c.screen_y, &x, &y)) << c.height;
+        EXPECT_EQ(c.changed != 0, FollowScreenFont(c.height, c.screen_x, c.screen_y, &x, &y)) << c.height;
         EXPECT_EQ(c.x * 1000 + c.y, x * 1000 + y) << c.height << " " << c.screen_x;
     }
 }
 
-class DesktopPageTest : public ::testing::Test {
-protected:
-    void TearDown() override { ResetAllModules(); }
-};
+struct DesktopPageTest : ::testing::Test { void TearDown() override { ResetAllModules(); } };
 
 void Slide(HWND sheet, int id, int code, int thumb = 0)
 {
-    HWND page = Page(sheet);
-    SendMessageA(page, WM_HSCROLL, MAKEWPARAM(code, thumb), (LPARAM)GetDlgItem(page, id));
+    SendMessageA(Page(sheet), WM_HSCROLL, MAKEWPARAM(code, thumb), (LPARAM)GetDlgItem(Page(sheet), id));
 }
 
 std::string ControlText(HWND page, int id)
@@ -108,16 +82,11 @@ std::string ControlText(HWND page, int id)
 // Each slider's label, position and last position (the font's: its dpi).
 std::string Shown(HWND sheet)
 {
-    HWND page = Page(sheet);
     std::string shown;
-    for (int id : {IDC_DESKTOP_RES_SLIDER, IDC_DESKTOP_COLOUR_SLIDER, IDC_DESKTOP_FONT_SLIDER,
-                   IDC_DESKTOP_REFRESH_SLIDER}) {
-        char text[80];
-        wsprintfA(text, "%s%s @%d/%d", shown.empty() ? "" : " | ", ControlText(page, id + 1).c_str(),
-                  (int)SendDlgItemMessageA(page, id, TBM_GETPOS, 0, 0),
-                  (int)SendDlgItemMessageA(page, id, TBM_GETRANGEMAX, 0, 0));
-        shown += text;
-    }
+    for (int id : {IDC_DESKTOP_RES_SLIDER, IDC_DESKTOP_COLOUR_SLIDER, IDC_DESKTOP_FONT_SLIDER, IDC_DESKTOP_REFRESH_SLIDER})
+        shown += (shown.empty() ? "" : " | ") + ControlText(Page(sheet), id + 1) + " @" +
+                 std::to_string(SendDlgItemMessageA(Page(sheet), id, TBM_GETPOS, 0, 0)) + "/" +
+                 std::to_string(SendDlgItemMessageA(Page(sheet), id, TBM_GETRANGEMAX, 0, 0));
     return shown;
 }
 
@@ -125,9 +94,8 @@ TEST_F(DesktopPageTest, SlidersWalkTheModeTable)
 {
     ASSERT_NO_FATAL_FAILURE(BootDefaultAndDetect());
     static const SimListedMode modes[] = {
-        {640, 480, 8, 4, {60, 72, 75, 85}},    {800, 600, 8, 5, {56, 60, 72, 76, 85}},
-        {800, 600, 16, 1, {60}},               {1024, 768, 8, 5, {60, 70, 72, 75, 85}},
-        {1280, 1024, 8, 0, {}},
+        {640, 480, 8, 4, {60, 72, 75, 85}}, {800, 600, 8, 5, {56, 60, 72, 76, 85}}, {800, 600, 16, 1, {60}},
+        {1024, 768, 8, 5, {60, 70, 72, 75, 85}}, {1280, 1024, 8, 0, {}},
     };
     SimSetModeList(modes, sizeof modes / sizeof modes[0]);
     AdapterRecord* a = CurrentAdapter();
@@ -160,16 +128,9 @@ TEST_F(DesktopPageTest, SlidersWalkTheModeTable)
 
 TEST_F(DesktopPageTest, TitleNamesTheDriverElseTheProduct)
 {
-    static const struct {
-        int windows;
-        bool description;
-        const char* texts;
-        const char* title;
-    } cases[] = {
-        {SIM_WINDOWS_98, true, "", "Card Under Test"},
-        {SIM_WINDOWS_NT4, true, "", "Card Under Test"},
-        {SIM_WINDOWS_98, false, "[Setup]\nproduct=Panel Here\n", "Panel Here"},
-        {SIM_WINDOWS_NT4, false, "", "Vistrel"},
+    static const struct { int windows, description; const char *texts, *title; } cases[] = {
+        {SIM_WINDOWS_98, 1, "", "Card Under Test"},  {SIM_WINDOWS_NT4, 1, "", "Card Under Test"},
+        {SIM_WINDOWS_98, 0, "[Setup]\nproduct=Panel Here\n", "Panel Here"}, {SIM_WINDOWS_NT4, 0, "", "Vistrel"},
     };
     for (const auto& c : cases) {
         SimCardConfig card = Card(0x5333, 0x8901);
@@ -181,10 +142,9 @@ TEST_F(DesktopPageTest, TitleNamesTheDriverElseTheProduct)
         lstrcpynA(text_ini_path, texts.c_str(), sizeof text_ini_path);
         char key[DRIVER_KEY_SIZE];
         ASSERT_EQ(1, FindDriverKey(key));
-        const char* name = c.windows == SIM_WINDOWS_NT4 ? "Device Description" : "DriverDesc";
         HKEY driver;
         ASSERT_EQ(ERROR_SUCCESS, RegOpenKeyExA(HKEY_LOCAL_MACHINE, key, 0, KEY_SET_VALUE, &driver));
-        if (!c.description) RegDeleteValueA(driver, name);
+        if (!c.description) RegDeleteValueA(driver, "DriverDesc"), RegDeleteValueA(driver, "Device Description");
         RegCloseKey(driver);
         EXPECT_TRUE(RunSheet(PAGE_DESKTOP, [&](HWND sheet) {
             EXPECT_EQ(c.title, ControlText(Page(sheet), IDC_DESKTOP_TITLE)) << c.windows;
@@ -192,8 +152,7 @@ TEST_F(DesktopPageTest, TitleNamesTheDriverElseTheProduct)
     }
 }
 
-// The last line the CRT controller shows, from its vertical display end
-// (CR12, bit 8 in CR07 bit 1, bit 9 in CR07 bit 6).
+// The CRT controller's vertical display end: CR12, bit 8 in CR07 bit 1, bit 9 in CR07 bit 6.
 int VisibleLines()
 {
     int overflow = SimReadRegister(0, SIM_REG_CRTC, 0x07);
@@ -204,10 +163,9 @@ TEST_F(DesktopPageTest, ApplyChangesTheCardAndACancelledModeComesBack)
 {
     ASSERT_NO_FATAL_FAILURE(BootDefaultAndDetect());
     ASSERT_EQ(768, VisibleLines());
-    std::string before;
     EXPECT_TRUE(RunSheet(PAGE_DESKTOP, [&](HWND sheet) {
             Slide(sheet, IDC_DESKTOP_RES_SLIDER, TB_LINEUP);
-            before = Shown(sheet);
+            std::string before = Shown(sheet);
             DialogAnswerer keep(IDOK);
             Apply(sheet);
             EXPECT_EQ(1, keep.answered);
