@@ -107,8 +107,9 @@ TEST_F(ModeChange, AChangeWindowsMakesOnlyAfterARestartStoresTheChoice)
     ASSERT_EQ(DISP_CHANGE_RESTART, ApplyDisplayMode(NULL, DM_BITSPERPEL, a->width, a->height, bits, 96, 96, chosen));
     EXPECT_EQ(before.bits_per_pixel, a->bits_per_pixel);
     EXPECT_EQ(before.refresh_hz, a->refresh_hz);
-    EXPECT_EQ(bits, LoadSetting(SETTING_BITS));
-    EXPECT_EQ(chosen, LoadSetting(SETTING_REFRESH));
+    const int stored[][2] = {{SETTING_BITS, bits}, {SETTING_REFRESH, chosen}, {SETTING_WIDTH, before.width},
+                             {SETTING_HEIGHT, before.height}};
+    for (const auto& s : stored) EXPECT_EQ(s[1], LoadSetting(s[0])) << "setting " << s[0];
 }
 
 static int restarts;

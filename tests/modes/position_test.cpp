@@ -88,8 +88,11 @@ TEST_F(Position, SavedRegistersComeBackInTheirModeOnly)
     EXPECT_EQ(0u, SimGetCounters()->port_reads + SimGetCounters()->port_writes);
     EXPECT_EQ(-1, LoadSetting(SETTING_POSITION_H));
     StepPicture(STEP_RIGHT, 1);
-    SavePosition(-1, 0);
-    EXPECT_EQ(0x83, LoadSetting(SETTING_POSITION_H));
+    for (int h : {1, -1}) {
+        SaveSetting(SETTING_POSITION_H, 0);  // 0 deletes
+        SavePosition(h, 0);
+        EXPECT_EQ(0x83, LoadSetting(SETTING_POSITION_H)) << h;
+    }
     EXPECT_EQ(-1, LoadSetting(SETTING_POSITION_V));
     StepPicture(STEP_UP, 4);
     SavePosition(0, 4);
