@@ -243,6 +243,41 @@ LRESULT CALLBACK DriverWindowProc(HWND window, UINT message, WPARAM wparam, LPAR
     return DefWindowProcA(window, message, wparam, lparam);
 }
 
+// A mode change on one card. Only the primary's mode is stored for the next
+// start and shown on Wine's desktop.
+LONG ChangeCardMode(int card, DEVMODEA* mode, DWORD flags)
+{
+    sim_counters.mode_changes++;
+    bool primary = card == PrimaryCard();
+    SimDriverMode want = sim->cards[card].mode;
+    int frequency = 0;
+    if (!mode) {
+        if (primary) RegistryReadDisplaySettings(&want);
+        frequency = want.requested;
+        flags &= ~CDS_UPDATEREGISTRY;
+    } else {
+        if (mode->dmFields & DM_PELSWIDTH) want.width = (uint16_t)mode->dmPelsWidth;
+        if (mode->dmFields & DM_PELSHEIGHT) want.height = (uint16_t)mode->dmPelsHeight;
+        if (mode->dmFields & DM_BITSPERPEL) want.bits = (uint16_t)mode->dmBitsPerPel;
+        if (mode->dmFields & DM_DISPLAYFREQUENCY) frequency = (int)mode->dmDisplayFrequency;
+    }
+    SimModeLimits limits = DisplayCardLimits(card);
+    if (!SimModeOffered(&limits, want.width, want.height, want.bits)) return DISP_CHANGE_BADMODE;
+    if (IsNt() && !FrequencyOffered(card, want.width, want.height, want.bits, frequency)) return DISP_CHANGE_BADMODE;
+    if (flags & CDS_TEST) return DISP_CHANGE_SUCCESSFUL;
+    want.requested = (uint16_t)(IsNt() ? frequency : 0);
+    // Windows 95 changes the colour depth only when it starts.
+    if (sim->config.windows == SIM_WINDOWS_95 && want.bits != sim->cards[card].mode.bits) {
+        if (flags & CDS_UPDATEREGISTRY) RegistryWriteDisplaySettings(card, &want);
+        return DISP_CHANGE_RESTART;
+    }
+    SetCardMode(card, want.width, want.height, want.bits, frequency, IsNt() && frequency > 1 && frequency < 50);
+    if (flags & CDS_UPDATEREGISTRY) RegistryWriteDisplaySettings(card, &sim->cards[card].mode);
+    if (primary) ShowOnWineDesktop(want.width, want.height, want.bits, true);
+    RepaintEverything();
+    return DISP_CHANGE_SUCCESSFUL;
+}
+
 }  // namespace
 
 SimModeLimits DisplayCardLimits(int card)
@@ -373,37 +408,21 @@ BOOL MachineEnumDisplaySettings(const char* device, DWORD mode_number, DEVMODEA*
 // looked at, as on Windows).
 LONG MachineChangeDisplaySettings(DEVMODEA* mode, DWORD flags)
 {
-    sim_counters.mode_changes++;
-    if (!sim) return ChangeDisplaySettingsA(mode, flags);
+    if (!sim) {
+        sim_counters.mode_changes++;
+        return ChangeDisplaySettingsA(mode, flags);
+    }
     int card = PrimaryCard();
     if (card < 0) return DISP_CHANGE_FAILED;
-    SimDriverMode want = sim->cards[card].mode;
-    int frequency = 0;
-    if (!mode) {
-        RegistryReadDisplaySettings(&want);
-        frequency = want.requested;
-        flags &= ~CDS_UPDATEREGISTRY;
-    } else {
-        if (mode->dmFields & DM_PELSWIDTH) want.width = (uint16_t)mode->dmPelsWidth;
-        if (mode->dmFields & DM_PELSHEIGHT) want.height = (uint16_t)mode->dmPelsHeight;
-        if (mode->dmFields & DM_BITSPERPEL) want.bits = (uint16_t)mode->dmBitsPerPel;
-        if (mode->dmFields & DM_DISPLAYFREQUENCY) frequency = (int)mode->dmDisplayFrequency;
-    }
-    SimModeLimits limits = DisplayCardLimits(card);
-    if (!SimModeOffered(&limits, want.width, want.height, want.bits)) return DISP_CHANGE_BADMODE;
-    if (IsNt() && !FrequencyOffered(card, want.width, want.height, want.bits, frequency)) return DISP_CHANGE_BADMODE;
-    if (flags & CDS_TEST) return DISP_CHANGE_SUCCESSFUL;
-    want.requested = (uint16_t)(IsNt() ? frequency : 0);
-    // Windows 95 changes the colour depth only when it starts.
-    if (sim->config.windows == SIM_WINDOWS_95 && want.bits != sim->cards[card].mode.bits) {
-        if (flags & CDS_UPDATEREGISTRY) RegistryWriteDisplaySettings(card, &want);
-        return DISP_CHANGE_RESTART;
-    }
-    SetCardMode(card, want.width, want.height, want.bits, frequency, IsNt() && frequency > 1 && frequency < 50);
-    if (flags & CDS_UPDATEREGISTRY) RegistryWriteDisplaySettings(card, &sim->cards[card].mode);
-    ShowOnWineDesktop(want.width, want.height, want.bits, true);
-    RepaintEverything();
-    return DISP_CHANGE_SUCCESSFUL;
+    return ChangeCardMode(card, mode, flags);
+}
+
+LONG WINAPI DisplayChangeSettingsEx(LPCSTR device, DEVMODEA* mode, HWND window, DWORD flags, LPVOID param)
+{
+    if (!sim || window || param) return DISP_CHANGE_BADPARAM;
+    int card = DeviceCard(device);
+    if (card < 0) return DISP_CHANGE_BADPARAM;
+    return ChangeCardMode(card, mode, flags);
 }
 
 // GetDeviceCaps(VREFRESH): what the card's registers give, named by the

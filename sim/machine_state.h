@@ -178,6 +178,8 @@ SimModeLimits DisplayCardLimits(int card);
 // Windows 98's display devices: the cards in display-device order (primary
 // first); the count is capped by [Machine] Monitors.
 int DisplayDeviceCards(int* cards);
+// ChangeDisplaySettingsExA of Windows 98: the named display device's card.
+LONG WINAPI DisplayChangeSettingsEx(LPCSTR device, DEVMODEA* mode, HWND window, DWORD flags, LPVOID param);
 
 // --- registry.cpp ---
 void RegistrySeedMachine();   // the places a real installation has (HKLM, HKCC), afresh

@@ -179,6 +179,8 @@ int MachineFindDisplayFunctions(MachineDisplayFunctions* out)
         out->MonitorFromPoint = (MonitorFromPoint_fn)GetProcAddress(user32, "MonitorFromPoint");
         out->MonitorFromRect = (MonitorFromRect_fn)GetProcAddress(user32, "MonitorFromRect");
         out->MonitorFromWindow = (MonitorFromWindow_fn)GetProcAddress(user32, "MonitorFromWindow");
+        out->ChangeDisplaySettingsExA =
+            (ChangeDisplaySettingsExA_fn)GetProcAddress(user32, "ChangeDisplaySettingsExA");
         return 1;
     }
     if (sim->config.windows != SIM_WINDOWS_98) return 1;
@@ -188,5 +190,6 @@ int MachineFindDisplayFunctions(MachineDisplayFunctions* out)
     out->MonitorFromPoint = SimMonitorFromPoint;
     out->MonitorFromRect = SimMonitorFromRect;
     out->MonitorFromWindow = SimMonitorFromWindow;
+    out->ChangeDisplaySettingsExA = DisplayChangeSettingsEx;
     return 1;
 }

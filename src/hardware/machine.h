@@ -56,6 +56,7 @@ typedef BOOL(WINAPI* GetMonitorInfoA_fn)(HMONITOR, LPMONITORINFO);
 typedef HMONITOR(WINAPI* MonitorFromPoint_fn)(POINT, DWORD);
 typedef HMONITOR(WINAPI* MonitorFromRect_fn)(LPCRECT, DWORD);
 typedef HMONITOR(WINAPI* MonitorFromWindow_fn)(HWND, DWORD);
+typedef LONG(WINAPI* ChangeDisplaySettingsExA_fn)(LPCSTR, DEVMODEA*, HWND, DWORD, LPVOID);
 struct MachineDisplayFunctions {
     EnumDisplayDevicesA_fn EnumDisplayDevicesA;
     EnumDisplayMonitors_fn EnumDisplayMonitors;
@@ -63,6 +64,7 @@ struct MachineDisplayFunctions {
     MonitorFromPoint_fn MonitorFromPoint;
     MonitorFromRect_fn MonitorFromRect;
     MonitorFromWindow_fn MonitorFromWindow;
+    ChangeDisplaySettingsExA_fn ChangeDisplaySettingsExA;
 };
 // Looked up once per call in USER32 (GetModuleHandleA + GetProcAddress); a
 // member is NULL where the system lacks the function. Returns 0 when USER32

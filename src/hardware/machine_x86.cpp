@@ -88,5 +88,6 @@ int MachineFindDisplayFunctions(MachineDisplayFunctions* out)
     out->MonitorFromPoint = (MonitorFromPoint_fn)GetProcAddress(user32, "MonitorFromPoint");
     out->MonitorFromRect = (MonitorFromRect_fn)GetProcAddress(user32, "MonitorFromRect");
     out->MonitorFromWindow = (MonitorFromWindow_fn)GetProcAddress(user32, "MonitorFromWindow");
+    out->ChangeDisplaySettingsExA = (ChangeDisplaySettingsExA_fn)GetProcAddress(user32, "ChangeDisplaySettingsExA");
     return 1;
 }

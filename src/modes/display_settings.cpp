@@ -2,9 +2,11 @@
 
 #include <windows.h>
 
+#include "base/adapters.h"
 #include "base/module_reset.h"
 #include "base/number.h"
 #include "base/runtime.h"
+#include "base/state.h"
 #include "hardware/machine.h"
 
 enum { LISTED_MODES_KEPT = 2048 };
@@ -13,13 +15,30 @@ static ListedMode listed[LISTED_MODES_KEPT];
 static int listed_count;
 static bool walked;      // listed[] holds the start of the list
 static bool truncated;   // the list goes on beyond what listed[] keeps
+static char walked_device[DEVICE_NAME_SIZE];  // whose list listed[] holds; "" the one display
+
+const char* CurrentDisplayDevice()
+{
+    const AdapterRecord* a = CurrentAdapter();
+    return IsWindows98() && monitor_count >= 2 && a->device_name[0] ? a->device_name : NULL;
+}
+
+LONG ChangeCurrentDisplay(DEVMODEA* mode, DWORD flags)
+{
+    const char* device = CurrentDisplayDevice();
+    MachineDisplayFunctions f;
+    // The plain form changes the primary display whatever dmDeviceName names.
+    if (device && MachineFindDisplayFunctions(&f) && f.ChangeDisplaySettingsExA)
+        return f.ChangeDisplaySettingsExA(device, mode, NULL, flags, NULL);
+    return MachineChangeDisplaySettings(mode, flags);
+}
 
 static bool ReadMode(DWORD n, ListedMode* out)
 {
     DEVMODEA mode;
     memset(&mode, 0, sizeof mode);
     mode.dmSize = sizeof mode;
-    if (!MachineEnumDisplaySettings(NULL, n, &mode)) return false;
+    if (!MachineEnumDisplaySettings(CurrentDisplayDevice(), n, &mode)) return false;
     out->width = (uint16_t)mode.dmPelsWidth;
     out->height = (uint16_t)mode.dmPelsHeight;
     out->bits_per_pixel = (uint16_t)mode.dmBitsPerPel;
@@ -34,6 +53,8 @@ static void Walk()
 {
     listed_count = 0;
     truncated = false;
+    const char* device = CurrentDisplayDevice();
+    lstrcpynA(walked_device, device ? device : "", sizeof walked_device);
     ListedMode mode;
     while (ReadMode((DWORD)listed_count, &mode)) {
         if (listed_count == LISTED_MODES_KEPT) {
@@ -47,7 +68,8 @@ static void Walk()
 
 void ForEachListedMode(bool (*visit)(const ListedMode* mode, void* data), void* data)
 {
-    if (!walked) Walk();
+    const char* device = CurrentDisplayDevice();
+    if (!walked || lstrcmpiA(walked_device, device ? device : "") != 0) Walk();
     for (int i = 0; i < listed_count; ++i)
         if (!visit(&listed[i], data)) return;
     // A list longer than what is kept is read on from the system each time.

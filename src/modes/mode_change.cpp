@@ -7,7 +7,7 @@
 #include "base/settings.h"
 #include "base/state.h"
 #include "chips/chips.h"
-#include "hardware/machine.h"
+#include "modes/display_settings.h"
 #include "modes/font_size.h"
 #include "modes/mode_keys.h"
 #include "modes/mode_list.h"
@@ -88,10 +88,10 @@ int SetRefreshRate(int target)
             DEVMODEA safe = request;
             safe.dmDisplayFrequency = nt_safe_rate;
             safe.dmDisplayFlags = 0;
-            MachineChangeDisplaySettings(&safe, 0);
+            ChangeCurrentDisplay(&safe, 0);
         }
         PrepareDisplayDriver(a->width, a->height, a->bits_per_pixel, frequency);
-        LONG r = MachineChangeDisplaySettings(&request, CDS_UPDATEREGISTRY);
+        LONG r = ChangeCurrentDisplay(&request, CDS_UPDATEREGISTRY);
         a->refresh_hz = (uint16_t)frequency;
         if (r != DISP_CHANGE_SUCCESSFUL) return 0;
     }
@@ -163,7 +163,7 @@ LONG ApplyDisplayMode(HWND owner, DWORD mask, int width, int height, int bits, i
     uint16_t saved = a->refresh_hz;
     a->refresh_hz = REFRESH_CHANGE_MARKER;
     PrepareDisplayDriver(width, height, bits, frequency);
-    LONG r = MachineChangeDisplaySettings(&request, CDS_UPDATEREGISTRY);
+    LONG r = ChangeCurrentDisplay(&request, CDS_UPDATEREGISTRY);
     a->refresh_hz = saved;
     if (r == DISP_CHANGE_SUCCESSFUL || r == DISP_CHANGE_RESTART) {
         // A change that waits for a restart leaves the old mode running.

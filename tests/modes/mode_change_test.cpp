@@ -112,6 +112,20 @@ TEST_F(ModeChange, AChangeWindowsMakesOnlyAfterARestartStoresTheChoice)
     for (const auto& s : stored) EXPECT_EQ(s[1], LoadSetting(s[0])) << "setting " << s[0];
 }
 
+// The second display device's mode, and its rate, go to the second card alone.
+TEST_F(ModeChange, TheSecondDisplayDeviceChangesOnlyTheSecondCard)
+{
+    ASSERT_NO_FATAL_FAILURE(BootTwoDisplayDevicesOn98());
+    const SimCardMode primary = SimGetCardMode(0);
+    ASSERT_EQ(DISP_CHANGE_SUCCESSFUL, ApplyDisplayMode(NULL, DM_PELSWIDTH | DM_PELSHEIGHT | DM_BITSPERPEL, 800, 600,
+                                                       32, 96, 96, 85));
+    const SimCardMode second = SimGetCardMode(1), first = SimGetCardMode(0);
+    EXPECT_TRUE(second.width == 800 && second.height == 600 && second.bits == 32) << second.width;
+    EXPECT_NEAR(85, SimRefreshHz(1), 1.0);
+    EXPECT_TRUE(first.width == primary.width && first.bits == primary.bits && first.refresh == primary.refresh)
+        << first.width << "x" << first.height << "x" << first.bits << "@" << first.refresh;
+}
+
 static int restarts;
 
 // Cancel goes back, and is what Enter presses on a screen one may not see;

@@ -143,3 +143,18 @@ TEST(ModeList, AHundredModesFillTheTableAndEndTheEnumeration)
     EXPECT_EQ(640 + 8 * 99, mode_table[99].width);
     EXPECT_EQ(60, mode_table[99].rates[0]);
 }
+
+// Each Windows 98 display device has its own list, whichever was read before.
+TEST(ModeList, EachDisplayDeviceListsItsOwnModes)
+{
+    ASSERT_NO_FATAL_FAILURE(BootTwoDisplayDevicesOn98());
+    for (int16_t adapter : {1, 0, 1}) {
+        current_adapter = adapter;
+        BuildModeTable(0);
+        bool deep = false;
+        for (int i = 0; i < MODE_TABLE_SIZE && mode_table[i].bits_per_pixel; ++i)
+            deep |= mode_table[i].width == 1024 && mode_table[i].bits_per_pixel == 32 && mode_table[i].rates[0];
+        EXPECT_EQ(adapter == 1, deep) << "adapter " << adapter;
+    }
+    FreeModeTable();
+}

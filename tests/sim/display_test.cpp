@@ -118,3 +118,25 @@ TEST(Display, NtListsFrequenciesLikeAMiniportAndRefusesOthers)
     EXPECT_NEAR(43.57, SimRefreshHz(0), 0.01);
     EXPECT_EQ(43, MachineScreenRefresh());
 }
+
+// Windows 98 alone has the Ex form, the one that reaches a second display
+// device: the plain form changes the primary whatever dmDeviceName says.
+TEST(Display, OnlyTheExFormChangesASecondDisplayDevice)
+{
+    for (int windows : {SIM_WINDOWS_95, SIM_WINDOWS_NT4}) {
+        BootWith(windows);
+        MachineDisplayFunctions f;
+        EXPECT_TRUE(MachineFindDisplayFunctions(&f) && !f.ChangeDisplaySettingsExA) << windows;
+    }
+    SimMachineConfig config = Machine(SIM_WINDOWS_98, {Card(0x5333, 0x8901, 0, 9), Card(0x5333, 0x8A01, 0, 10)});
+    config.start_bits = 16;
+    SimBoot(&config);
+    MachineDisplayFunctions f;
+    ASSERT_TRUE(MachineFindDisplayFunctions(&f) && f.ChangeDisplaySettingsExA);
+    DEVMODEA plain = Request(800, 600, 16), ex = Request(640, 480, 8);
+    lstrcpyA((char*)plain.dmDeviceName, "\\\\.\\DISPLAY2");
+    ASSERT_EQ(DISP_CHANGE_SUCCESSFUL, MachineChangeDisplaySettings(&plain, 0));
+    ASSERT_EQ(DISP_CHANGE_SUCCESSFUL, f.ChangeDisplaySettingsExA("\\\\.\\DISPLAY2", &ex, NULL, 0, NULL));
+    EXPECT_EQ(DISP_CHANGE_BADPARAM, f.ChangeDisplaySettingsExA("\\\\.\\DISPLAY3", &plain, NULL, 0, NULL));
+    EXPECT_TRUE(SimGetCardMode(0).width == 800 && SimGetCardMode(1).width == 640 && SimGetCardMode(1).bits == 8);
+}

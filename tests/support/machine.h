@@ -6,6 +6,7 @@
 
 #include <initializer_list>
 
+#include "base/adapters.h"
 #include "base/state.h"
 #include "modes/detect.h"
 #include "sim.h"
@@ -46,6 +47,19 @@ inline void BootDefaultAndDetect(int windows = SIM_WINDOWS_98)
     BootMachine(Machine(windows, {Card(0x5333, 0x8901)}));
     ASSERT_EQ(1, DetectAdapters()) << "Windows " << windows;
     RefreshAdapterModes(REFRESH_AT_STARTUP);
+}
+
+// Windows 98 with two display devices, detected, the second one's record
+// current: a 2 MB primary without 1024x768 at 32 bits, a 4 MB card with it.
+inline void BootTwoDisplayDevicesOn98()
+{
+    SimMachineConfig config = Machine(SIM_WINDOWS_98, {Card(0x5333, 0x8901, 0, 9), Card(0x5333, 0x8a01, 0, 10)});
+    config.cards[0].memory_mb = 2;
+    config.start_bits = 16;
+    BootMachine(config);
+    ASSERT_TRUE(DetectAdapters() == 1 && adapter_count == 2);
+    RefreshAdapterModes(REFRESH_AT_STARTUP);
+    current_adapter = 1;
 }
 
 #endif
