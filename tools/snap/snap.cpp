@@ -22,7 +22,7 @@ namespace {
 const UINT tray_callback = 1224, close_command = 209, first_page_command = 220;
 enum { RES_SLIDER = 1017, RES_LABEL = 1018, COLOUR_SLIDER = 1020, COLOUR_LABEL = 1021, FONT_SLIDER = 1023,
        FONT_LABEL = 1024, RATE_SLIDER = 1026, RATE_LABEL = 1027, INFO_LIST = 1020, MONITOR_ADJUST = 1023,
-       MONITOR_LIST = 1039, MONITOR_NT_PICTURE = 1040, PERF_SLIDER = 1050, PERF_VALUE = 1051, PANNING_SAVE = 1014,
+       INFO_AUTORUN = 1045, MONITOR_LIST = 1039, MONITOR_NT_PICTURE = 1040, PERF_SLIDER = 1050, PERF_VALUE = 1051, PANNING_SAVE = 1014,
        MESSAGE_TEXT = 0xFFFF };
 
 std::string out_folder;
@@ -220,8 +220,19 @@ HWND Control(HWND page, int id) { return GetDlgItem(page, id); }
 LRESULT Position(HWND page, int id) { return Send(Control(page, id), TBM_GETPOS); }
 LRESULT Maximum(HWND page, int id) { return Send(Control(page, id), TBM_GETRANGEMAX); }
 
+// The sheet opens beside the tray icon and grows to its pages' size, past the
+// screen's edge: the camera moves it where it can be seen whole.
+void Centre(HWND w)
+{
+    RECT r = Box(w);
+    int x = (GetSystemMetrics(SM_CXSCREEN) - (r.right - r.left)) / 2;
+    int y = (GetSystemMetrics(SM_CYSCREEN) - (r.bottom - r.top)) / 2;
+    SetWindowPos(w, NULL, x > 0 ? x : 0, y > 0 ? y : 0, 0, 0, SWP_NOSIZE | SWP_NOZORDER | SWP_NOACTIVATE);
+}
+
 HWND ShowPage(HWND sheet, int index)
 {
+    Centre(sheet);
     Send(sheet, PSM_SETCURSEL, index, 0);
     HWND page = (HWND)Send(sheet, PSM_GETCURRENTPAGEHWND);
     Settle(sheet);
@@ -270,7 +281,9 @@ void Confirmation(HWND sheet, HWND page)
     Photograph("confirm", Around(Join(Box(box), Box(sheet)), 8), caption.c_str());
     PostMessageA(box, WM_COMMAND, IDCANCEL, 0);
     Check(WaitGone(box), "Apply: the confirmation stays");
-    Send(sheet, WM_NULL);
+    // The old mode is set again before the sliders follow: wait for them.
+    for (DWORD start = GetTickCount(); GetTickCount() - start < 10000; Sleep(50))
+        if (Position(page, RES_SLIDER) == before && Text(Control(page, RES_LABEL)) == label) break;
     Check(Position(page, RES_SLIDER) == before && Text(Control(page, RES_LABEL)) == label,
           "Cancel: the resolution slider is at " + std::to_string(Position(page, RES_SLIDER)) + ", was " +
               std::to_string(before));
@@ -323,7 +336,7 @@ void Single(HWND main)
     if (!Check(sheet != NULL, "the menu's first entry opens no sheet")) return;
     HWND tabs = (HWND)Send(sheet, PSM_GETTABCONTROL);
     LRESULT pages = Send(tabs, TCM_GETITEMCOUNT);
-    Check(pages == 4, "the sheet has " + std::to_string(pages) + " pages");
+    Check(pages >= 3, "the sheet has " + std::to_string(pages) + " pages");
     Check(Send(tabs, TCM_GETCURSEL) == 0, "the sheet opens on another page than Desktop");
 
     HWND page = ShowPage(sheet, 0);
@@ -333,8 +346,9 @@ void Single(HWND main)
     page = ShowPage(sheet, 1);
     std::vector<std::string> info = ListLines(Control(page, INFO_LIST));
     for (const std::string& l : info) printf("tour:   Information: %s\n", l.c_str());
-    if (Check(Contains(info, "Trio64V2") || Contains(info, "8901"), "Information: no chip line"))
-        Photograph("information", Around(Box(sheet), 8), "Information page: the card, its chip and memory, the driver");
+    std::string autorun = Text(Control(page, INFO_AUTORUN));
+    if (Check(autorun.find("Windows starts") != std::string::npos, "Information: the start-up box says '" + autorun + "'"))
+        Photograph("information", Around(Box(sheet), 8), "Information page: the card, its driver and the start-up choice");
 
     page = ShowPage(sheet, 2);
     std::vector<std::string> monitor = ListLines(Control(page, MONITOR_LIST));
@@ -342,12 +356,15 @@ void Single(HWND main)
         Photograph("monitor", Around(Box(sheet), 8), "Monitor page: picture adjustment, power saving, the monitor's EDID");
     AdjustWindow(page);
 
-    page = ShowPage(sheet, 3);
-    LRESULT pos = Position(page, PERF_SLIDER), max = Maximum(page, PERF_SLIDER);
-    std::string clock = Text(Control(page, PERF_VALUE));
-    printf("tour:   Performance: %s (slider %d of %d)\n", clock.c_str(), (int)pos, (int)max);
-    if (Check(max > 0 && pos >= 0 && pos <= max && !clock.empty(), "Performance: no memory clock shown"))
-        Photograph("performance", Around(Box(sheet), 8), "Performance page: the memory clock");
+    // Only a chip that can tell its memory clock's limit has a Performance page.
+    if (pages > 3) {
+        page = ShowPage(sheet, 3);
+        LRESULT pos = Position(page, PERF_SLIDER), max = Maximum(page, PERF_SLIDER);
+        std::string clock = Text(Control(page, PERF_VALUE));
+        printf("tour:   Performance: %s (slider %d of %d)\n", clock.c_str(), (int)pos, (int)max);
+        if (Check(max > 0 && pos >= 0 && pos <= max && !clock.empty(), "Performance: no memory clock shown"))
+            Photograph("performance", Around(Box(sheet), 8), "Performance page: the memory clock");
+    }
 
     Confirmation(sheet, ShowPage(sheet, 0));
     CloseSheet(sheet);
@@ -422,6 +439,7 @@ int main(int argc, char** argv)
         fprintf(stderr, "usage: snap.exe <out folder> <machine folder> <wine version> <scenario>\n");
         return 2;
     }
+    SetProcessDPIAware();  // the other process's windows in the screen's own pixels
     out_folder = std::string(argv[1]) + "\\";
     std::string folder = std::string(argv[2]) + "\\", scenario = argv[4];
     const char* program = scenario == "panning" ? "tour-panning.exe" : "vistrel-sim.exe";
