@@ -84,7 +84,11 @@ bool Contains(const std::vector<std::string>& lines, const char* part)
 bool Start(const std::string& folder, const char* program, const char* version)
 {
     std::string key = std::string("Software\\Wine\\AppDefaults\\") + program;
-    RegSetKeyValueA(HKEY_CURRENT_USER, key.c_str(), "Version", REG_SZ, version, (DWORD)strlen(version) + 1);
+    HKEY defaults;
+    if (RegCreateKeyExA(HKEY_CURRENT_USER, key.c_str(), 0, NULL, 0, KEY_SET_VALUE, NULL, &defaults, NULL) == 0) {
+        RegSetValueExA(defaults, "Version", 0, REG_SZ, (const BYTE*)version, (DWORD)strlen(version) + 1);
+        RegCloseKey(defaults);
+    }
     std::string line = "\"" + folder + program + "\"";
     STARTUPINFOA start = {sizeof start};
     if (!CreateProcessA(NULL, &line[0], NULL, NULL, FALSE, 0, NULL, folder.c_str(), &start, &panel)) return false;
@@ -439,7 +443,6 @@ int main(int argc, char** argv)
         fprintf(stderr, "usage: snap.exe <out folder> <machine folder> <wine version> <scenario>\n");
         return 2;
     }
-    SetProcessDPIAware();  // the other process's windows in the screen's own pixels
     out_folder = std::string(argv[1]) + "\\";
     std::string folder = std::string(argv[2]) + "\\", scenario = argv[4];
     const char* program = scenario == "panning" ? "tour-panning.exe" : "vistrel-sim.exe";
