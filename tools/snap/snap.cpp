@@ -157,9 +157,11 @@ void Settle(HWND w)
 bool Photograph(const char* name, RECT r, const char* caption)
 {
     RECT screen = {0, 0, GetSystemMetrics(SM_CXSCREEN), GetSystemMetrics(SM_CYSCREEN)};
+    long asked = (r.right - r.left) * (r.bottom - r.top);
     IntersectRect(&r, &r, &screen);
     int width = r.right - r.left, height = r.bottom - r.top;
-    if (!Check(width > 0 && height > 0, std::string(name) + ": nothing on the screen to photograph")) return false;
+    if (!Check(2L * width * height >= asked && width > 0, std::string(name) + ": the window is off the screen"))
+        return false;
     BITMAPINFOHEADER head = {sizeof head, width, height, 1, 24, BI_RGB};
     void* bits = NULL;
     HDC screen_dc = GetDC(NULL), memory = CreateCompatibleDC(screen_dc);
