@@ -101,3 +101,15 @@ add_custom_target(test-runtime ALL
   DEPENDS HookKeep)
 
 include(${VISTREL_ROOT}/tests/tests.cmake)
+
+# The tour's camera and the panning dialog it photographs (tools/tour).
+add_executable(tour-snap ${VISTREL_ROOT}/tools/snap/snap.cpp)
+target_link_libraries(tour-snap PRIVATE comctl32 gdi32 user32 shell32 advapi32)
+target_link_options(tour-snap PRIVATE ${VISTREL_STATIC_RUNTIME})
+set_target_properties(tour-snap PROPERTIES RUNTIME_OUTPUT_DIRECTORY ${CMAKE_BINARY_DIR}/tools)
+add_executable(tour-panning WIN32 ${VISTREL_ROOT}/tools/snap/panning.cpp ${VISTREL_ROOT}/sim/boot_description.cpp
+               ${VISTREL_ROOT}/resources/vistrel.rc)
+target_include_directories(tour-panning PRIVATE ${VISTREL_ROOT}/src ${VISTREL_ROOT}/sim ${VISTREL_ROOT}/resources)
+target_link_libraries(tour-panning PRIVATE vistrel_core vistrel_sim)
+target_link_options(tour-panning PRIVATE ${VISTREL_STATIC_RUNTIME})
+set_target_properties(tour-panning PROPERTIES RUNTIME_OUTPUT_DIRECTORY ${SIM_DIR})

@@ -147,3 +147,41 @@ class Canvas:
         """The one pixel holding the design unit (x, y)."""
         k = self.scale
         self.put(int((x + 0.5) * k), int((y + 0.5) * k), colour)
+
+
+def write_png(path, width, height, rows):
+    """A 24-bit PNG; rows are top to bottom, each bytes of R, G, B."""
+    import struct
+    import zlib
+
+    def chunk(kind, data):
+        return struct.pack(">I", len(data)) + kind + data + struct.pack(">I", zlib.crc32(kind + data))
+
+    raw = b"".join(b"\0" + bytes(row) for row in rows)
+    with open(path, "wb") as f:
+        f.write(b"\x89PNG\r\n\x1a\n")
+        f.write(chunk(b"IHDR", struct.pack(">IIBBBBB", width, height, 8, 2, 0, 0, 0)))
+        f.write(chunk(b"IDAT", zlib.compress(raw, 9)))
+        f.write(chunk(b"IEND", b""))
+
+
+def read_bmp(path):
+    """Width, height and top-to-bottom RGB rows of an uncompressed 24-bit BMP."""
+    import struct
+    with open(path, "rb") as f:
+        data = f.read()
+    offset, = struct.unpack_from("<I", data, 10)
+    width, height, _, bits = struct.unpack_from("<iiHH", data, 18)
+    if bits != 24:
+        raise ValueError("%s: %d bits per pixel" % (path, bits))
+    stride = (width * 3 + 3) & ~3
+    rows = []
+    for y in range(abs(height)):
+        start = offset + y * stride
+        bgr = data[start:start + width * 3]
+        rgb = bytearray(len(bgr))
+        rgb[0::3], rgb[1::3], rgb[2::3] = bgr[2::3], bgr[1::3], bgr[0::3]
+        rows.append(rgb)
+    if height > 0:
+        rows.reverse()
+    return width, abs(height), rows
