@@ -174,10 +174,33 @@ void ControlAnimation(HWND control, AnimationOperation operation)
     }
 }
 
+POINT PlaceInside(const RECT* window, const RECT* area)
+{
+    POINT at = {window->left, window->top};
+    LONG width = window->right - window->left, height = window->bottom - window->top;
+    if (at.x + width > area->right) at.x = area->right - width;
+    if (at.y + height > area->bottom) at.y = area->bottom - height;
+    if (at.x < area->left) at.x = area->left;
+    if (at.y < area->top) at.y = area->top;
+    return at;
+}
+
+// The sheet opens beside the tray and only then grows to hold its pages,
+// which would take it past the screen's edge.
+static void KeepSheetOnScreen(HWND sheet)
+{
+    RECT window, area;
+    if (!GetWindowRect(sheet, &window) || !SystemParametersInfoA(SPI_GETWORKAREA, 0, &area, 0)) return;
+    POINT at = PlaceInside(&window, &area);
+    if (at.x != window.left || at.y != window.top)
+        SetWindowPos(sheet, NULL, at.x, at.y, 0, 0, SWP_NOSIZE | SWP_NOZORDER | SWP_NOACTIVATE);
+}
+
 void AnimatePage(HWND page, UINT message, LPARAM lparam, int frame_id, HWND* control)
 {
     switch (message) {
     case WM_INITDIALOG: {
+        KeepSheetOnScreen(GetParent(page));
         HWND frame = GetDlgItem(page, frame_id);
         RECT rect;
         GetClientRect(frame, &rect);

@@ -40,4 +40,8 @@ void ControlAnimation(HWND control, AnimationOperation operation);
 // page; control is the page's own variable for it.
 void AnimatePage(HWND page, UINT message, LPARAM lparam, int frame_id, HWND* control);
 
+// Where a window of this place lies wholly inside area: moved the least, and
+// at area's top left where it is larger than area.
+POINT PlaceInside(const RECT* window, const RECT* area);
+
 #endif

@@ -43,12 +43,12 @@ static void CALLBACK Tick(HWND, UINT, UINT_PTR, DWORD)
 }
 
 // Whether a sheet was shown and the step run in it.
-bool RunSheet(int requested_page, std::function<void(HWND sheet)> inside)
+bool RunSheet(int requested_page, std::function<void(HWND sheet)> inside, HWND owner)
 {
     step = inside;
     seen = 0;
     UINT_PTR timer = SetTimer(NULL, 0, 10, Tick);
-    OpenPropertySheet(instance, NULL, requested_page);
+    OpenPropertySheet(instance, owner, requested_page);
     KillTimer(NULL, timer);
     return seen > 0;
 }
@@ -152,6 +152,28 @@ TEST(Sheet, PagesTitlesStartPageAndAnimation)
         DeleteFileA(clip.c_str());
         EXPECT_EQ(c.opened, opened) << c.clip;
     }
+}
+
+// Opened by the 1 x 1 window in the tray's corner, the sheet still shows whole.
+TEST(Sheet, StaysInsideTheWorkArea)
+{
+    const RECT area = {0, 0, 1024, 740};
+    const struct { RECT window; LONG x, y; } cases[] = {
+        {{1023, 767, 1493, 1214}, 554, 293}, {{-30, -5, 440, 442}, 0, 0}, {{10, 20, 480, 467}, 10, 20},
+        {{500, 0, 1600, 900}, 0, 0}};
+    for (const auto& c : cases) {
+        POINT at = PlaceInside(&c.window, &area);
+        EXPECT_TRUE(at.x == c.x && at.y == c.y) << c.window.left << " -> " << at.x << "," << at.y;
+    }
+    ASSERT_NO_FATAL_FAILURE(BootDefaultAndDetect());
+    RECT work, placed = {};
+    SystemParametersInfoA(SPI_GETWORKAREA, 0, &work, 0);
+    HWND corner = CreateWindowExA(WS_EX_TOOLWINDOW, "STATIC", "", WS_POPUP | WS_VISIBLE, work.right - 1,
+                                  work.bottom - 1, 1, 1, NULL, NULL, NULL, NULL);
+    EXPECT_TRUE(RunSheet(PAGE_MONITOR, [&](HWND sheet) { GetWindowRect(sheet, &placed); }, corner));
+    DestroyWindow(corner);
+    RECT inside;
+    EXPECT_TRUE(IntersectRect(&inside, &placed, &work) && EqualRect(&inside, &placed));
 }
 
 std::string keep_calls;  // the hook library's calls, "state,enable,minutes;" each

@@ -8,7 +8,7 @@
 
 // Opens the sheet on the requested page, runs inside once the sheet has
 // settled, then cancels it; whether a sheet was shown and inside ran.
-bool RunSheet(int requested_page, std::function<void(HWND sheet)> inside);
+bool RunSheet(int requested_page, std::function<void(HWND sheet)> inside, HWND owner = NULL);
 HWND Page(HWND sheet);
 bool Enabled(HWND window, int id);
 extern const int apply_button;
