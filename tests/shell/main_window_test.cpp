@@ -300,7 +300,11 @@ TEST_F(MainWindow, ClickOpensTheMenuFromTheQueueAndAgainAfterCancelMode)
         EXPECT_TRUE(OnTrayCallback(stand_in, 0, ignored) == 0 && shell_state == 0) << ignored;
     EXPECT_EQ(0, SendMessageA(stand_in, MSG_TRAY_CALLBACK, 0, WM_RBUTTONDOWN));
     EXPECT_TRUE(menus_at.empty() && shell_state == (STATE_TRAY_BUSY | STATE_MENU_PENDING));
-    EXPECT_TRUE(PumpUntil([](void*) { return shell_state == 0; }, NULL, 10000));
+    for (DWORD start = GetTickCount(); shell_state && GetTickCount() - start < 10000;) {
+        for (MSG m; PeekMessageA(&m, NULL, 0, 0, PM_REMOVE);) DispatchMessageA(&m);
+        MsgWaitForMultipleObjects(0, NULL, FALSE, 20, QS_ALLINPUT);
+    }
+    EXPECT_EQ(0, shell_state);
     ASSERT_EQ(2u, menus_at.size());
     for (POINT p : menus_at) EXPECT_EQ(300 * 1000 + 200, p.x * 1000 + p.y);
 }

@@ -74,9 +74,6 @@ TEST(S3, TotalsAndRefreshFromTheRegisters)
         {0x8901, "CR5D bit 0, CR5E bit 0; CR5F is no part",
          {{SIM_REG_CRTC, 0x5D, 0x01}, {SIM_REG_CRTC, 0x5E, 0x01}, cr5f}, 356, 1549, hz_12h * 100 * 525 / (356 * 1549)},
         {0x8A20, "Savage3D: CR5F bits 1..0, counted double", {cr5f, cr43}, 2 * (0x5F + 512) + 5, 525, 0},
-        {0x8901, "the synthesizer, M = 95, N = 12, R = 1",
-         {{SIM_REG_MISC, 0, 0xEF}, {SIM_REG_SEQUENCER, 0x12, 0x2C}, {SIM_REG_SEQUENCER, 0x13, 0x5F}}, 100, 525,
-         49602266.43 / (800 * 525)},
     };
     for (const auto& c : cases) {
         if (!SimConfig() || SimConfig()->cards[0].device_id != c.device) BootS3(c.device);

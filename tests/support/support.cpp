@@ -169,13 +169,3 @@ std::vector<int> OfferedRates(int width, int height, int bits)
     while (int r = rates.size() < 40 ? RefreshRateAt((int)rates.size(), width, height, bits) : 0) rates.push_back(r);
     return rates;
 }
-
-bool PumpUntil(bool (*condition)(void*), void* data, DWORD ms)
-{
-    MSG msg;
-    for (DWORD start = GetTickCount(); !condition(data); MsgWaitForMultipleObjects(0, NULL, FALSE, 20, QS_ALLINPUT)) {
-        if (GetTickCount() - start >= ms) return false;
-        while (PeekMessageA(&msg, NULL, 0, 0, PM_REMOVE)) TranslateMessage(&msg), DispatchMessageA(&msg);
-    }
-    return true;
-}

@@ -49,7 +49,5 @@ struct DialogAnswerer {
 
 // The rates RefreshRateAt offers for a mode, in order, until the list ends.
 std::vector<int> OfferedRates(int width, int height, int bits);
-// Pumps this thread's messages until the condition holds or ms pass.
-bool PumpUntil(bool (*condition)(void*), void* data, DWORD ms);
 
 #endif
