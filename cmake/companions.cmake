@@ -1,5 +1,7 @@
 # The companions, built the same way for both machines; each carries the
 # version resource of resources/version.rc2.
+set_source_files_properties(${VISTREL_ROOT}/companions/hookkeep.rc ${VISTREL_ROOT}/companions/gatectl.rc
+                            PROPERTIES OBJECT_DEPENDS ${VISTREL_ROOT}/resources/version.rc2)
 # SetKeepHook is stdcall and exported without decoration (--kill-at).
 add_library(HookKeep SHARED ${VISTREL_ROOT}/companions/hookkeep.cpp ${VISTREL_ROOT}/companions/keep_call.cpp
             ${VISTREL_ROOT}/companions/hookkeep.def ${VISTREL_ROOT}/companions/hookkeep.rc)
