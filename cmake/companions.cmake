@@ -1,12 +1,15 @@
-# HookKeep.dll and gatectl.exe, built the same way for both machines.
+# The companions, built the same way for both machines; each carries the
+# version resource of resources/version.rc2.
+set_source_files_properties(${VISTREL_ROOT}/companions/hookkeep.rc ${VISTREL_ROOT}/companions/gatectl.rc
+                            PROPERTIES OBJECT_DEPENDS ${VISTREL_ROOT}/resources/version.rc2)
 # SetKeepHook is stdcall and exported without decoration (--kill-at).
 add_library(HookKeep SHARED ${VISTREL_ROOT}/companions/hookkeep.cpp ${VISTREL_ROOT}/companions/keep_call.cpp
-            ${VISTREL_ROOT}/companions/hookkeep.def)
+            ${VISTREL_ROOT}/companions/hookkeep.def ${VISTREL_ROOT}/companions/hookkeep.rc)
 set_target_properties(HookKeep PROPERTIES PREFIX "" OUTPUT_NAME HookKeep IMPORT_PREFIX "lib" IMPORT_SUFFIX ".dll.a")
-target_compile_options(HookKeep PRIVATE ${VISTREL_PROGRAM_FLAGS} ${VISTREL_CODE_FLAGS})
+target_compile_options(HookKeep PRIVATE $<$<COMPILE_LANGUAGE:CXX>:${VISTREL_PROGRAM_FLAGS} ${VISTREL_CODE_FLAGS}>)
 target_link_options(HookKeep PRIVATE -Wl,--kill-at ${VISTREL_COMPANION_LINK_FLAGS} ${VISTREL_DLL_ENTRY})
 target_link_libraries(HookKeep PRIVATE vistrel_runtime user32 ${VISTREL_RUNTIME_LIBS})
-target_include_directories(HookKeep PRIVATE ${VISTREL_ROOT}/companions ${VISTREL_ROOT}/src)
+target_include_directories(HookKeep PRIVATE ${VISTREL_ROOT}/companions ${VISTREL_ROOT}/src ${VISTREL_ROOT}/resources)
 if(CMAKE_SIZEOF_VOID_P EQUAL 4)
   # ld's import library carries the killed name too, where a 32-bit caller
   # looks for _SetKeepHook@16; dlltool -k keeps the decoration for the
@@ -16,17 +19,29 @@ if(CMAKE_SIZEOF_VOID_P EQUAL 4)
 endif()
 
 add_executable(gatectl WIN32 ${VISTREL_ROOT}/companions/gatectl.cpp ${VISTREL_ROOT}/companions/gate.cpp
-               ${VISTREL_ROOT}/src/hardware/shutdown.cpp)
-target_compile_options(gatectl PRIVATE ${VISTREL_PROGRAM_FLAGS} ${VISTREL_CODE_FLAGS})
+               ${VISTREL_ROOT}/src/hardware/shutdown.cpp ${VISTREL_ROOT}/companions/gatectl.rc)
+target_compile_options(gatectl PRIVATE $<$<COMPILE_LANGUAGE:CXX>:${VISTREL_PROGRAM_FLAGS} ${VISTREL_CODE_FLAGS}>)
 target_link_options(gatectl PRIVATE ${VISTREL_COMPANION_LINK_FLAGS} ${VISTREL_EXE_ENTRY})
 target_link_libraries(gatectl PRIVATE vistrel_runtime user32 advapi32 ${VISTREL_RUNTIME_LIBS})
-target_include_directories(gatectl PRIVATE ${VISTREL_ROOT}/companions ${VISTREL_ROOT}/src)
+target_include_directories(gatectl PRIVATE ${VISTREL_ROOT}/companions ${VISTREL_ROOT}/src ${VISTREL_ROOT}/resources)
 
 # loupe.exe, the zoom tool the menu starts; its icon is the menu's magnifier.
 add_executable(loupe WIN32 ${VISTREL_ROOT}/companions/loupe.cpp ${VISTREL_ROOT}/companions/loupe_command.cpp
                ${VISTREL_ROOT}/companions/loupe.rc)
-set_source_files_properties(${VISTREL_ROOT}/companions/loupe.rc PROPERTIES OBJECT_DEPENDS ${VISTREL_ROOT}/resources/zoom.ico)
+set_source_files_properties(${VISTREL_ROOT}/companions/loupe.rc PROPERTIES
+                            OBJECT_DEPENDS "${VISTREL_ROOT}/resources/zoom.ico;${VISTREL_ROOT}/resources/version.rc2")
 target_compile_options(loupe PRIVATE $<$<COMPILE_LANGUAGE:CXX>:${VISTREL_PROGRAM_FLAGS} ${VISTREL_CODE_FLAGS}>)
 target_link_options(loupe PRIVATE ${VISTREL_COMPANION_LINK_FLAGS} ${VISTREL_EXE_ENTRY})
 target_link_libraries(loupe PRIVATE vistrel_runtime user32 gdi32 ${VISTREL_RUNTIME_LIBS})
 target_include_directories(loupe PRIVATE ${VISTREL_ROOT}/companions ${VISTREL_ROOT}/src ${VISTREL_ROOT}/resources)
+
+# dxprobe.exe, the DirectX information tool the menu starts. DirectDraw is
+# loaded at run time; dxguid holds only the interface ids.
+add_executable(dxprobe WIN32 ${VISTREL_ROOT}/companions/dxprobe.cpp ${VISTREL_ROOT}/companions/dxprobe_lines.cpp
+               ${VISTREL_ROOT}/companions/dxprobe.rc)
+set_source_files_properties(${VISTREL_ROOT}/companions/dxprobe.rc PROPERTIES
+                            OBJECT_DEPENDS "${VISTREL_ROOT}/resources/directx.ico;${VISTREL_ROOT}/resources/version.rc2")
+target_compile_options(dxprobe PRIVATE $<$<COMPILE_LANGUAGE:CXX>:${VISTREL_PROGRAM_FLAGS} ${VISTREL_CODE_FLAGS}>)
+target_link_options(dxprobe PRIVATE ${VISTREL_COMPANION_LINK_FLAGS} ${VISTREL_EXE_ENTRY})
+target_link_libraries(dxprobe PRIVATE vistrel_runtime user32 gdi32 version dxguid ${VISTREL_RUNTIME_LIBS})
+target_include_directories(dxprobe PRIVATE ${VISTREL_ROOT}/companions ${VISTREL_ROOT}/src ${VISTREL_ROOT}/resources)

@@ -12,7 +12,7 @@ target_include_directories(vistrel_runtime PRIVATE ${VISTREL_ROOT}/src)
 target_compile_options(vistrel_runtime PRIVATE ${VISTREL_PROGRAM_FLAGS})
 
 include(${VISTREL_ROOT}/cmake/companions.cmake)
-set_target_properties(HookKeep gatectl loupe PROPERTIES RUNTIME_OUTPUT_DIRECTORY ${SIM_DIR} LIBRARY_OUTPUT_DIRECTORY ${SIM_DIR})
+set_target_properties(HookKeep gatectl loupe dxprobe PROPERTIES RUNTIME_OUTPUT_DIRECTORY ${SIM_DIR} LIBRARY_OUTPUT_DIRECTORY ${SIM_DIR})
 
 # The program without its process entry, shared by vistrel-sim.exe and the tests.
 add_library(vistrel_core STATIC ${VISTREL_PROGRAM_SOURCES})

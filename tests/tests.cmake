@@ -71,5 +71,10 @@ target_compile_definitions(test-pages PRIVATE VISTREL_TEST_DATA="${VISTREL_ROOT}
                            VISTREL_RESOURCES="${VISTREL_ROOT}/resources")
 vistrel_add_test(pages pages)
 
-# loupe.exe's command line and screen part, linked into the companions' tests.
-target_sources(test-companions PRIVATE ${VISTREL_ROOT}/companions/loupe_command.cpp)
+# loupe.exe's command line and screen part and dxprobe.exe's lines, linked
+# into the companions' tests; the real dxprobe.exe runs beside them.
+target_sources(test-companions PRIVATE ${VISTREL_ROOT}/companions/loupe_command.cpp
+               ${VISTREL_ROOT}/companions/dxprobe_lines.cpp)
+add_dependencies(test-companions dxprobe)
+# The version resources of the product's files, read beside the simulated build's.
+target_compile_definitions(test-companions PRIVATE VISTREL_PRODUCT_DIR="Z:${VISTREL_ROOT}/build/product")
