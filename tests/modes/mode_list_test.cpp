@@ -84,6 +84,9 @@ TEST(ModeList, NTTableAndListsWalkedOnceUntilTheDisplayChanges)
     EXPECT_EQ(rates, OfferedRates(640, 480, 8));
     EXPECT_EQ(rates.back(), MaxRefreshRate(640, 480, 8));
     EXPECT_EQ(1u, SimGetCounters()->enum_settings_walks);
+    SimResetCounters();
+    OfferedRates(640, 480, 8);
+    EXPECT_EQ(0u, SimGetCounters()->enum_settings_calls) << "a list kept whole is not read on";
 
     // While the program changes the mode itself, a display change re-reads
     // no mode, but the list all the same.
