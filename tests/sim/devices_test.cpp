@@ -42,13 +42,11 @@ TEST(NtDevice, RequestsAndTheirRefusals)
         {0x9C402400, &port, 4, 4, ERROR_INVALID_FUNCTION},  // right function, wrong access bits
         {3, &port, 4, 4, ERROR_INVALID_FUNCTION},           // the 9x device's request
         {read_byte, &port, 3, 1, ERROR_INSUFFICIENT_BUFFER},
-        {read_byte, &port, 4, 0, ERROR_INSUFFICIENT_BUFFER},
         {read_dword, &port, 4, 3, ERROR_INSUFFICIENT_BUFFER},
         {write_byte, write, 4, 0, ERROR_INSUFFICIENT_BUFFER},
         {write_byte, NULL, 5, 0, ERROR_INSUFFICIENT_BUFFER},
         {write_dword, write, 7, 0, ERROR_INSUFFICIENT_BUFFER},
         {read_header, where, 4, 399, ERROR_INSUFFICIENT_BUFFER},
-        {read_header, where, 3, 400, ERROR_INSUFFICIENT_BUFFER},
         {read_header, no_slot, 4, 400, ERROR_INVALID_PARAMETER},
         {read_byte, &too_wide, 4, 1, ERROR_INVALID_PARAMETER},
     };
