@@ -147,9 +147,16 @@ TEST_F(SystemTest, OnWindows98)
         PostMessageA(menu, WM_KEYDOWN, key, 1), PostMessageA(menu, WM_KEYUP, key, 0xC0000001);
     HWND sheet = panel.Shown("#32770");
     ASSERT_TRUE(sheet != NULL) << "no sheet";
-    // The Monitor page, its list filled (what it lists: the page's own tests).
+    // The Monitor page, read from here: the default monitor's EDID lines.
     HWND list = GetDlgItem((HWND)SendMessageA(sheet, PSM_GETCURRENTPAGEHWND, 0, 0), monitor_list_id);
-    EXPECT_GT(SendMessageA(list, LB_GETCOUNT, 0, 0), 20);
+    std::wstring lines;
+    for (LRESULT i = 0, count = SendMessageW(list, LB_GETCOUNT, 0, 0); i < count; ++i) {
+        wchar_t text[256] = L"";
+        SendMessageW(list, LB_GETTEXT, i, (LPARAM)text);
+        lines += text + std::wstring(L"\n");
+    }
+    EXPECT_NE(std::wstring::npos, lines.find(L"Year of Manufacture :\n        1998\nMax H. Image Size(cm) :\n        30\n"
+                                              L"Max V. Image Size(cm) :\n        23\n"));
     PostMessageA(sheet, PSM_PRESSBUTTON, PSBTN_CANCEL, 0);
     for (DWORD start = GetTickCount(); IsWindow(sheet) && GetTickCount() - start < 10000;) Sleep(20);
     ASSERT_FALSE(IsWindow(sheet));
