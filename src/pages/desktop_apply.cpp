@@ -9,7 +9,6 @@
 #include "hardware/driver_key.h"
 #include "hardware/shutdown.h"
 #include "modes/mode_change.h"
-#include "pages/desktop_page.h"
 
 enum { TITLE_SIZE = 40, MESSAGE_SIZE = 255 };
 
@@ -72,6 +71,5 @@ int ApplyDesktopPage(HWND page, DesktopSelection* selection)
     }
     *selection = before;
     ApplyDisplayMode(page, mask, before.width, before.height, before.bits, before.dpi_x, before.dpi_y, before.refresh);
-    SetupDesktopSliders(page);
     return 0;
 }

@@ -11,8 +11,7 @@ struct DesktopSelection {
     int refresh;
 };
 // Changes to the selection, asks the user to keep it and goes back to the
-// mode before when not; on Cancel the selection holds that mode again and
-// the page's sliders show it (selection is the page's own).
+// mode before when not; on Cancel the selection holds that mode again.
 int ApplyDesktopPage(HWND page, DesktopSelection* selection);
 
 #endif

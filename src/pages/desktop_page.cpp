@@ -290,7 +290,10 @@ INT_PTR CALLBACK DesktopPageProc(HWND page, UINT message, WPARAM wparam, LPARAM 
     case WM_COMMAND: return TRUE;
     case WM_NOTIFY:
         if (((const NMHDR*)lparam)->code == (UINT)PSN_APPLY) {
+            DesktopSelection asked = selection;
             ApplyDesktopPage(page, &selection);
+            // A refused mode came back: the sliders show it again.
+            if (memcmp(&asked, &selection, sizeof asked) != 0) SetupDesktopSliders(page);
             PropSheet_UnChanged(GetParent(page), page);
             SetWindowLongPtrA(page, DWLP_MSGRESULT, PSNRET_NOERROR);
         }

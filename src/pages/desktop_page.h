@@ -1,4 +1,4 @@
-// The Desktop page's sliders, for its Apply to set back after a revert.
+// The Desktop page's sliders, set from its selection: when it opens and after a refused mode.
 #ifndef VISTREL_DESKTOP_PAGE_H
 #define VISTREL_DESKTOP_PAGE_H
 
