@@ -96,7 +96,7 @@ TEST(ModeList, NTTableAndListsWalkedOnceUntilTheDisplayChanges)
     MainWindowProc(window, WM_DISPLAYCHANGE, 8, MAKELPARAM(1024, 768));
     EXPECT_EQ(1, CurrentAdapter()->width);
     RefreshRateAt(0, 800, 600, 8);
-    EXPECT_EQ(2u, SimGetCounters()->enum_settings_walks);
+    EXPECT_EQ(1u, SimGetCounters()->enum_settings_walks);
     DestroyWindow(window);
 }
 
