@@ -1,6 +1,6 @@
 # The companions, built the same way for both machines; each carries the
 # version resource of resources/version.rc2.
-set_source_files_properties(${VISTREL_ROOT}/companions/hookkeep.rc ${VISTREL_ROOT}/companions/gatectl.rc
+set_source_files_properties(${VISTREL_ROOT}/companions/hookkeep.rc
                             PROPERTIES OBJECT_DEPENDS ${VISTREL_ROOT}/resources/version.rc2)
 # SetKeepHook is stdcall and exported without decoration (--kill-at).
 add_library(HookKeep SHARED ${VISTREL_ROOT}/companions/hookkeep.cpp ${VISTREL_ROOT}/companions/keep_call.cpp
@@ -18,30 +18,27 @@ if(CMAKE_SIZEOF_VOID_P EQUAL 4)
     COMMAND ${CMAKE_DLLTOOL} -k -d ${VISTREL_ROOT}/companions/hookkeep.def -l $<TARGET_LINKER_FILE:HookKeep>)
 endif()
 
-add_executable(gatectl WIN32 ${VISTREL_ROOT}/companions/gatectl.cpp ${VISTREL_ROOT}/companions/gate.cpp
-               ${VISTREL_ROOT}/src/hardware/shutdown.cpp ${VISTREL_ROOT}/companions/gatectl.rc)
-target_compile_options(gatectl PRIVATE $<$<COMPILE_LANGUAGE:CXX>:${VISTREL_PROGRAM_FLAGS} ${VISTREL_CODE_FLAGS}>)
-target_link_options(gatectl PRIVATE ${VISTREL_COMPANION_LINK_FLAGS} ${VISTREL_EXE_ENTRY})
-target_link_libraries(gatectl PRIVATE vistrel_runtime user32 advapi32 ${VISTREL_RUNTIME_LIBS})
-target_include_directories(gatectl PRIVATE ${VISTREL_ROOT}/companions ${VISTREL_ROOT}/src ${VISTREL_ROOT}/resources)
+# A companion program: its sources, its icon (or none) and the system
+# libraries it links besides the runtime.
+function(vistrel_companion name icon)
+  cmake_parse_arguments(C "" "" "SOURCES;LIBS" ${ARGN})
+  add_executable(${name} WIN32 ${C_SOURCES} ${VISTREL_ROOT}/companions/${name}.rc)
+  set_source_files_properties(${VISTREL_ROOT}/companions/${name}.rc PROPERTIES
+                              OBJECT_DEPENDS "${icon};${VISTREL_ROOT}/resources/version.rc2")
+  target_compile_options(${name} PRIVATE $<$<COMPILE_LANGUAGE:CXX>:${VISTREL_PROGRAM_FLAGS} ${VISTREL_CODE_FLAGS}>)
+  target_link_options(${name} PRIVATE ${VISTREL_COMPANION_LINK_FLAGS} ${VISTREL_EXE_ENTRY})
+  target_link_libraries(${name} PRIVATE vistrel_runtime ${C_LIBS} ${VISTREL_RUNTIME_LIBS})
+  target_include_directories(${name} PRIVATE ${VISTREL_ROOT}/companions ${VISTREL_ROOT}/src ${VISTREL_ROOT}/resources)
+endfunction()
 
+vistrel_companion(gatectl "" SOURCES ${VISTREL_ROOT}/companions/gatectl.cpp ${VISTREL_ROOT}/companions/gate.cpp
+                  ${VISTREL_ROOT}/src/hardware/shutdown.cpp LIBS user32 advapi32)
 # loupe.exe, the zoom tool the menu starts; its icon is the menu's magnifier.
-add_executable(loupe WIN32 ${VISTREL_ROOT}/companions/loupe.cpp ${VISTREL_ROOT}/companions/loupe_command.cpp
-               ${VISTREL_ROOT}/companions/loupe.rc)
-set_source_files_properties(${VISTREL_ROOT}/companions/loupe.rc PROPERTIES
-                            OBJECT_DEPENDS "${VISTREL_ROOT}/resources/zoom.ico;${VISTREL_ROOT}/resources/version.rc2")
-target_compile_options(loupe PRIVATE $<$<COMPILE_LANGUAGE:CXX>:${VISTREL_PROGRAM_FLAGS} ${VISTREL_CODE_FLAGS}>)
-target_link_options(loupe PRIVATE ${VISTREL_COMPANION_LINK_FLAGS} ${VISTREL_EXE_ENTRY})
-target_link_libraries(loupe PRIVATE vistrel_runtime user32 gdi32 ${VISTREL_RUNTIME_LIBS})
-target_include_directories(loupe PRIVATE ${VISTREL_ROOT}/companions ${VISTREL_ROOT}/src ${VISTREL_ROOT}/resources)
-
+vistrel_companion(loupe ${VISTREL_ROOT}/resources/zoom.ico
+                  SOURCES ${VISTREL_ROOT}/companions/loupe.cpp ${VISTREL_ROOT}/companions/loupe_command.cpp
+                  LIBS user32 gdi32)
 # dxprobe.exe, the DirectX information tool the menu starts. DirectDraw is
 # loaded at run time; dxguid holds only the interface ids.
-add_executable(dxprobe WIN32 ${VISTREL_ROOT}/companions/dxprobe.cpp ${VISTREL_ROOT}/companions/dxprobe_lines.cpp
-               ${VISTREL_ROOT}/companions/dxprobe.rc)
-set_source_files_properties(${VISTREL_ROOT}/companions/dxprobe.rc PROPERTIES
-                            OBJECT_DEPENDS "${VISTREL_ROOT}/resources/directx.ico;${VISTREL_ROOT}/resources/version.rc2")
-target_compile_options(dxprobe PRIVATE $<$<COMPILE_LANGUAGE:CXX>:${VISTREL_PROGRAM_FLAGS} ${VISTREL_CODE_FLAGS}>)
-target_link_options(dxprobe PRIVATE ${VISTREL_COMPANION_LINK_FLAGS} ${VISTREL_EXE_ENTRY})
-target_link_libraries(dxprobe PRIVATE vistrel_runtime user32 gdi32 version dxguid ${VISTREL_RUNTIME_LIBS})
-target_include_directories(dxprobe PRIVATE ${VISTREL_ROOT}/companions ${VISTREL_ROOT}/src ${VISTREL_ROOT}/resources)
+vistrel_companion(dxprobe ${VISTREL_ROOT}/resources/directx.ico
+                  SOURCES ${VISTREL_ROOT}/companions/dxprobe.cpp ${VISTREL_ROOT}/companions/dxprobe_lines.cpp
+                  LIBS user32 gdi32 version dxguid)
