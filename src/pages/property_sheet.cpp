@@ -30,21 +30,17 @@ enum {
     PROGRAM_PATH_SIZE = 160,
 };
 
-struct PageRow {
-    int icon;
-    const char* title_key;
-    const char* default_title;
-    DLGPROC procedure;
+// In sheet order, by page number; the tray menu names its page entries alike.
+static const PageLabel page_labels[PAGE_COUNT] = {
+    {.icon = IDI_DESKTOP_PAGE, .key = "MenuA", .fallback = "Desktop"},
+    {.icon = IDI_INFORMATION_PAGE, .key = "MenuB", .fallback = "Information"},
+    {.icon = IDI_MONITOR_PAGE, .key = "MenuC", .fallback = "Monitor"},
+    {.icon = IDI_PERFORMANCE_PAGE, .key = "MenuSpeed", .fallback = "Performance"},
 };
-// In sheet order, by page number.
-static const PageRow page_rows[PAGE_COUNT] = {
-    {.icon = IDI_DESKTOP_PAGE, .title_key = "MenuA", .default_title = "Desktop", .procedure = DesktopPageProc},
-    {.icon = IDI_INFORMATION_PAGE, .title_key = "MenuB", .default_title = "Information",
-     .procedure = InformationPageProc},
-    {.icon = IDI_MONITOR_PAGE, .title_key = "MenuC", .default_title = "Monitor", .procedure = MonitorPageProc},
-    {.icon = IDI_PERFORMANCE_PAGE, .title_key = "MenuSpeed", .default_title = "Performance",
-     .procedure = PerformancePageProc},
-};
+static const DLGPROC page_procedures[PAGE_COUNT] = {DesktopPageProc, InformationPageProc, MonitorPageProc,
+                                                    PerformancePageProc};
+
+const PageLabel* PageLabelOf(int page) { return &page_labels[page]; }
 
 // The sheet keeps pointers to the titles.
 static char page_titles[PAGE_COUNT][TITLE_SIZE];
@@ -82,17 +78,17 @@ void OpenPropertySheet(HINSTANCE inst, HWND owner, int requested_page)
     for (int page = 0; page < PAGE_COUNT; ++page) {
         if (!PageIncluded(page)) continue;
         included |= 1u << page;
-        const PageRow& row = page_rows[page];
-        LoadText(row.title_key, row.default_title, page_titles[page], TITLE_SIZE);
+        const PageLabel& label = page_labels[page];
+        LoadText(label.key, label.fallback, page_titles[page], TITLE_SIZE);
         PROPSHEETPAGEA_V1& p = pages[count++];
         memset(&p, 0, sizeof p);
         p.dwSize = PROPSHEETPAGEA_V1_SIZE;
         p.dwFlags = PSP_USEICONID | PSP_USETITLE;
         p.hInstance = inst;
         p.pszTemplate = MAKEINTRESOURCEA(ChoosePageTemplate(page));
-        p.pszIcon = MAKEINTRESOURCEA(row.icon);
+        p.pszIcon = MAKEINTRESOURCEA(label.icon);
         p.pszTitle = page_titles[page];
-        p.pfnDlgProc = row.procedure;
+        p.pfnDlgProc = page_procedures[page];
     }
     if (!count) return;
 

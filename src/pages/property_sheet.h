@@ -11,6 +11,15 @@
 // base/texts.h); returns when the user closes it.
 void OpenPropertySheet(HINSTANCE inst, HWND owner, int requested_page);
 
+// A page's tab: its icon, and its title's key and English text in the text file.
+struct PageLabel {
+    int icon;
+    const char* key;
+    const char* fallback;
+};
+// page: PAGE_DESKTOP ... PAGE_PERFORMANCE.
+const PageLabel* PageLabelOf(int page);
+
 // The pages the chip of the adapter at current_adapter allows: bit n for
 // page n.
 unsigned IncludedPages();

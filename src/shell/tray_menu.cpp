@@ -37,13 +37,6 @@ struct MenuEntry {
     int icon;
 };
 
-// By page number, with the commands of adapter 0.
-static const MenuEntry page_entries[MENU_PAGES_PER_ADAPTER] = {
-    {.command = 220, .key = "MenuA", .fallback = "Desktop", .icon = IDI_DESKTOP_PAGE},
-    {.command = 221, .key = "MenuB", .fallback = "Information", .icon = IDI_INFORMATION_PAGE},
-    {.command = 222, .key = "MenuC", .fallback = "Monitor", .icon = IDI_MONITOR_PAGE},
-    {.command = 223, .key = "MenuSpeed", .fallback = "Performance", .icon = IDI_PERFORMANCE_PAGE},
-};
 // The Performance entry in an adapter's submenu.
 static const MenuEntry adapter_performance_entry = {
     .command = 223, .key = "MenuMem", .fallback = "Performance Adjustment", .icon = IDI_PERFORMANCE_PAGE};
@@ -116,7 +109,7 @@ static int CountBits(unsigned bits)
 
 static UINT PageCommand(int adapter, int page)
 {
-    return page_entries[page].command + (UINT)MENU_PAGES_PER_ADAPTER * adapter;
+    return (UINT)(MENU_FIRST_PAGE + page + MENU_PAGES_PER_ADAPTER * adapter);
 }
 
 // The pages of the adapter at current_adapter that get an entry: those its
@@ -133,8 +126,9 @@ static void AppendPageEntries(HMENU menu, int adapter, unsigned offered, bool in
 {
     for (int page = 0; page < MENU_PAGES_PER_ADAPTER; ++page) {
         if (!(offered >> page & 1)) continue;
-        const MenuEntry& entry =
-            in_adapter_menu && page == PAGE_PERFORMANCE ? adapter_performance_entry : page_entries[page];
+        const PageLabel* label = PageLabelOf(page);
+        MenuEntry entry = {.command = 0, .key = label->key, .fallback = label->fallback, .icon = label->icon};
+        if (in_adapter_menu && page == PAGE_PERFORMANCE) entry = adapter_performance_entry;
         AppendOwnerDrawn(menu, MF_STRING, PageCommand(adapter, page), entry.key, entry.fallback, ENTRY_TEXT_SIZE, entry.icon);
     }
 }
