@@ -70,6 +70,18 @@ static AdapterRecord* NewRecord(uint16_t vendor_id, uint16_t device_id, uint8_t 
     return a;
 }
 
+// The clock the user chose on the Performance page, again at each start
+// with Windows; a stored value outside the card's range (a damaged or
+// hand-edited registry) would drive the memory beyond what it takes.
+static void ReapplyMemoryClock()
+{
+    int32_t mclk = LoadSetting(SETTING_MCLK);
+    if (mclk <= 0) return;
+    uint32_t highest = chip_get_mclk_max();
+    if ((uint32_t)mclk < chip_get_mclk_min() || (uint32_t)mclk > highest || highest == 0) return;
+    chip_set_mclk((uint32_t)mclk);
+}
+
 static void CompleteRecord(const char* section_format)
 {
     AdapterRecord* a = CurrentAdapter();
@@ -79,10 +91,7 @@ static void CompleteRecord(const char* section_format)
         a->flags |= ADAPTER_NO_CLOCK_REFRESH;
     a->mapped_registers = chip_map_registers();
     a->flags |= chip_init();
-    if (startup_flags & STARTUP_AUTORUN) {
-        int32_t mclk = LoadSetting(SETTING_MCLK);
-        if (mclk > 0) chip_set_mclk((uint32_t)mclk);
-    }
+    if (startup_flags & STARTUP_AUTORUN) ReapplyMemoryClock();
 }
 
 static void DetectOnWindows9x()

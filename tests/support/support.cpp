@@ -146,6 +146,7 @@ static LRESULT CALLBACK AnswerHook(int code, WPARAM wparam, LPARAM lparam)
         a->caption = caption;
         EnumChildWindows(window, ReadStatic, (LPARAM)&a->text);
         a->answered = 1;
+        if (a->while_asked) a->while_asked();
         PostMessageA(window, WM_COMMAND, MAKEWPARAM(a->button, BN_CLICKED), (LPARAM)GetDlgItem(window, a->button));
     }
     return CallNextHookEx(answer_hook, code, wparam, lparam);

@@ -5,6 +5,7 @@
 
 #include <windows.h>
 
+#include <functional>
 #include <string>
 #include <vector>
 
@@ -45,6 +46,7 @@ struct DialogAnswerer {
     ~DialogAnswerer();
     int button, answered = 0, default_button = 0;
     std::string text, caption;
+    std::function<void()> while_asked;  // runs while the question is open
 };
 
 // The rates RefreshRateAt offers for a mode, in order, until the list ends.

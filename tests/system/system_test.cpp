@@ -8,6 +8,7 @@
 #include <windows.h>
 #include <prsht.h>
 #include <shellapi.h>
+#include <commctrl.h>
 
 #include <string>
 #include <vector>
@@ -220,6 +221,72 @@ TEST_F(SystemTest, OnWindowsNTTheExtendedRateComesFromThePixelClock)
     ASSERT_TRUE(panel.WaitWindow());
     EXPECT_NEAR(panel.RefreshHz(), (double)panel.Send(msg_get_refresh, 0), 1.0);
     panel.SetExtendedRate("CHIP8901_NT4E");
+}
+
+// The memory clock of simstate's report, in whole MHz.
+static int CardMhz(Panel& panel) { return (int)(atof(panel.State("Card0", "MemoryClockHz").c_str()) / 1e6 + 0.5); }
+
+// A top-level window of the panel's process of that class other than not, once it is shown.
+static HWND ShownOtherThan(Panel& panel, const char* cls, HWND not_this)
+{
+    for (DWORD start = GetTickCount(); GetTickCount() - start < 10000; Sleep(20))
+        for (HWND w = NULL; (w = FindWindowExA(NULL, w, cls, NULL));) {
+            DWORD owner = 0;
+            GetWindowThreadProcessId(w, &owner);
+            if (w != not_this && owner == panel.process.info.dwProcessId && IsWindowVisible(w)) return w;
+        }
+    return NULL;
+}
+
+// The Performance page sets the TNT's memory clock; only a kept clock is stored, and
+// "/A" after a reboot brings it back. The refresh the card runs is the one reported.
+TEST_F(SystemTest, RivaTntMemoryClockThroughThePerformancePage)
+{
+    const std::string machine = "[Machine]\r\nWindows=98\r\n[Card0]\r\nId=10de:0020\r\nBus=1\r\nDevice=0\r\nMemoryMB=16\r\n";
+    const char* tnt_key = "SOFTWARE\\QUORVEL\\PANEL\\10de0020";
+    const int performance_command = 223, apply_id = 1053, slider_id = 1050;
+    Panel panel(machine);
+    ASSERT_TRUE(panel.Start("win98"));
+    HWND w = panel.WaitWindow();
+    ASSERT_TRUE(w);
+    EXPECT_NEAR(panel.RefreshHz(), (double)panel.Send(msg_get_refresh, 0), 1.0);
+    const int before = CardMhz(panel);
+
+    PostMessageA(w, WM_COMMAND, performance_command, 0);
+    HWND sheet = panel.Shown("#32770");
+    ASSERT_TRUE(sheet != NULL) << "no sheet";
+    HWND page = (HWND)SendMessageA(sheet, PSM_GETCURRENTPAGEHWND, 0, 0);
+    // Chooses before + 10 MHz, applies it and answers the question.
+    auto apply = [&](int answer) {
+        SendMessageA(page, WM_HSCROLL, MAKEWPARAM(TB_THUMBTRACK, before + 10), (LPARAM)GetDlgItem(page, slider_id));
+        PostMessageA(page, WM_COMMAND, MAKEWPARAM(apply_id, BN_CLICKED), (LPARAM)GetDlgItem(page, apply_id));
+        HWND question = ShownOtherThan(panel, "#32770", sheet);
+        ASSERT_TRUE(question != NULL) << "no question";
+        EXPECT_NEAR(before + 10, CardMhz(panel), 4);
+        EXPECT_EQ("", ReadRegistryRaw(HKEY_LOCAL_MACHINE, tnt_key, "mclk")) << "stored before the answer";
+        PostMessageA(question, WM_COMMAND, answer, 0);
+        for (DWORD start = GetTickCount(); IsWindow(question) && GetTickCount() - start < 10000;) Sleep(20);
+        panel.Send(WM_NULL, 0);
+    };
+    apply(IDCANCEL);
+    EXPECT_NEAR(before, CardMhz(panel), 1);
+    EXPECT_EQ(std::to_string(before), ReadRegistryRaw(HKEY_LOCAL_MACHINE, tnt_key, "mclk"));
+    RegDeleteKeyValueA(HKEY_LOCAL_MACHINE, tnt_key, "mclk");
+    apply(IDOK);
+    const int kept = CardMhz(panel);
+    EXPECT_NEAR(before + 10, kept, 4);
+    EXPECT_EQ(std::to_string(before + 10), ReadRegistryRaw(HKEY_LOCAL_MACHINE, tnt_key, "mclk"));
+    panel.process.Kill();
+
+    // A reboot resets the card; only "/A" sets the stored clock again.
+    panel.Describe(machine + "; rebooted\r\n");
+    ASSERT_TRUE(panel.Start("win98"));
+    ASSERT_TRUE(panel.WaitWindow());
+    EXPECT_EQ(before, CardMhz(panel));
+    panel.process.Kill();
+    ASSERT_TRUE(panel.Start("win98", "/A"));
+    ASSERT_TRUE(panel.WaitWindow());
+    EXPECT_EQ(kept, CardMhz(panel));
 }
 
 TEST_F(SystemTest, NoSupportedCardShowsTheTextAndEnds)
