@@ -78,9 +78,9 @@ static uint32_t InDword(uint16_t port)
 }
 static void RmaWrite(uint32_t offset, uint32_t value)
 {
-    WriteCr(0x38, 0xA3);
+    WriteCr(0x38, 0xFB);  // bits 7..3 are no part of the phase
     ASSERT_NO_FATAL_FAILURE(OutDword(0x3D0, offset));
-    WriteCr(0x38, 0xA5);
+    WriteCr(0x38, 0xFD);
     ASSERT_NO_FATAL_FAILURE(OutDword(0x3D0, value));
 }
 static uint32_t RmaRead(uint32_t offset)
@@ -151,6 +151,10 @@ TEST(Riva, DmtModesRunAtTheirRates)
         EXPECT_EQ(t->htotal / 8, SimHTotal(0));
         EXPECT_EQ(t->vtotal, SimVTotal(0));
         EXPECT_NEAR(SimTimingFrameRate(t), SimRefreshHz(0), 1.0) << c.w << "x" << c.h << "@" << c.hz;
+        SimWriteRegister(0, SIM_REG_CRTC, 0x2D, 0x01);
+        SimWriteRegister(0, SIM_REG_CRTC, 0x25, SimReadRegister(0, SIM_REG_CRTC, 0x25) ^ 0x01);
+        EXPECT_EQ(t->htotal / 8 + 256, SimHTotal(0)) << "CR2D bit 0 is bit 8 of the total";
+        EXPECT_EQ(((t->vtotal - 2) ^ 1024) + 2, SimVTotal(0)) << "CR25 bit 0 is bit 10";
     }
 }
 
