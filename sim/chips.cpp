@@ -99,5 +99,9 @@ const SimChip* SimCardChip(int card)
 
 const SimFamilyOps* SimCardOps(int card)
 {
-    return SimCardChip(card)->family == SIM_FAMILY_S3 ? &sim_s3_ops : &sim_vga_ops;
+    switch (SimCardChip(card)->family) {
+    case SIM_FAMILY_S3: return &sim_s3_ops;
+    case SIM_FAMILY_NVIDIA: return &sim_riva_ops;
+    default: return &sim_vga_ops;
+    }
 }

@@ -156,6 +156,10 @@ bool ReadCard(const Profile* p, int n, SimCardConfig* card, bool* primary)
     v = card->memory_extra_kb;
     ReadInt(p, "MemoryExtraKB", 0, 1023, 10, &v);
     card->memory_extra_kb = (uint32_t)v;
+    // The straps offer two crystals; any other value keeps the default.
+    v = card->crystal_hz;
+    ReadInt(p, "CrystalHz", 13500000, 14318180, 10, &v);
+    if (v == 13500000 || v == 14318180) card->crystal_hz = (uint32_t)v;
     ReadBool(p, "DisplayDevice", &card->display_device);
     ReadBool(p, "Attached", &card->attached);
     ReadBool(p, "DeviceNode", &card->device_node);
@@ -198,6 +202,7 @@ void SimDefaultCard(SimCardConfig* card, uint16_t vendor_id, uint16_t device_id)
     card->device_node = true;
     card->has_edid = true;
     memcpy(card->edid, default_edid, sizeof default_edid);
+    card->crystal_hz = 14318180;
 }
 
 void SimDefaultMachine(SimMachineConfig* config)

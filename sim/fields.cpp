@@ -1,7 +1,8 @@
 // Register field tables and the one reader and writer of split values.
-// Sources: the IBM VGA register description (CR00-CR18, SR01, MISC), and for
+// Sources: the IBM VGA register description (CR00-CR18, SR01, MISC), for
 // the S3 bits Linux s3fb.c and savagefb, the X.org s3virge and savage
-// drivers and the 86Box S3 model.
+// drivers and the 86Box S3 model; for the NVIDIA bits the X.org nv driver,
+// Linux rivafb (riva_hw.c) and envytools.
 #include "fields.h"
 
 int SimFieldWidth(const SimField* field)
@@ -166,4 +167,63 @@ const SimS3Fields sim_s3 = {
     .offset = {.piece_count = 2,
                .pieces = {{.reg = 0x13, .low_bit = 0, .high_bit = 7}, {.reg = 0x51, .low_bit = 4, .high_bit = 5}}},
     .color_mode = {.piece_count = 1, .pieces = {{.reg = 0x67, .low_bit = 4, .high_bit = 7}}},
+};
+
+// NVIDIA: CR25 carries bit 10 of the vertical total, display end, retrace
+// start and blanking start (bits 0..3) and bit 6 of the horizontal blanking
+// end (bit 4); CR2D bit 8 of the horizontal total, display end, blanking
+// start and retrace start (bits 0..3).
+constexpr SimCrtcFields sim_nv_crtc = {
+    .htotal = {.piece_count = 2,
+               .pieces = {{.reg = 0x00, .low_bit = 0, .high_bit = 7}, {.reg = 0x2D, .low_bit = 0, .high_bit = 0}}},
+    .hdisplay_end = {.piece_count = 2,
+                     .pieces = {{.reg = 0x01, .low_bit = 0, .high_bit = 7},
+                                {.reg = 0x2D, .low_bit = 1, .high_bit = 1}}},
+    .hblank_start = {.piece_count = 2,
+                     .pieces = {{.reg = 0x02, .low_bit = 0, .high_bit = 7},
+                                {.reg = 0x2D, .low_bit = 2, .high_bit = 2}}},
+    .hblank_end = {.piece_count = 3,
+                   .pieces = {{.reg = 0x03, .low_bit = 0, .high_bit = 4},
+                              {.reg = 0x05, .low_bit = 7, .high_bit = 7},
+                              {.reg = 0x25, .low_bit = 4, .high_bit = 4}}},
+    .hsync_start = {.piece_count = 2,
+                    .pieces = {{.reg = 0x04, .low_bit = 0, .high_bit = 7}, {.reg = 0x2D, .low_bit = 3, .high_bit = 3}}},
+    .hsync_end = sim_vga_crtc.hsync_end,
+    .vtotal = {.piece_count = 4,
+               .pieces = {{.reg = 0x06, .low_bit = 0, .high_bit = 7},
+                          {.reg = 0x07, .low_bit = 0, .high_bit = 0},
+                          {.reg = 0x07, .low_bit = 5, .high_bit = 5},
+                          {.reg = 0x25, .low_bit = 0, .high_bit = 0}}},
+    .vdisplay_end = {.piece_count = 4,
+                     .pieces = {{.reg = 0x12, .low_bit = 0, .high_bit = 7},
+                                {.reg = 0x07, .low_bit = 1, .high_bit = 1},
+                                {.reg = 0x07, .low_bit = 6, .high_bit = 6},
+                                {.reg = 0x25, .low_bit = 1, .high_bit = 1}}},
+    .vblank_start = {.piece_count = 4,
+                     .pieces = {{.reg = 0x15, .low_bit = 0, .high_bit = 7},
+                                {.reg = 0x07, .low_bit = 3, .high_bit = 3},
+                                {.reg = 0x09, .low_bit = 5, .high_bit = 5},
+                                {.reg = 0x25, .low_bit = 3, .high_bit = 3}}},
+    .vblank_end = sim_vga_crtc.vblank_end,
+    .vsync_start = {.piece_count = 4,
+                    .pieces = {{.reg = 0x10, .low_bit = 0, .high_bit = 7},
+                               {.reg = 0x07, .low_bit = 2, .high_bit = 2},
+                               {.reg = 0x07, .low_bit = 7, .high_bit = 7},
+                               {.reg = 0x25, .low_bit = 2, .high_bit = 2}}},
+    .vsync_end = sim_vga_crtc.vsync_end,
+    .line_compare = sim_vga_crtc.line_compare,
+};
+
+const SimNvFields sim_nv = {
+    .pll_m = {.piece_count = 1, .pieces = {{.reg = 0, .low_bit = 0, .high_bit = 7}}},
+    .pll_n = {.piece_count = 1, .pieces = {{.reg = 1, .low_bit = 0, .high_bit = 7}}},
+    .pll_p = {.piece_count = 1, .pieces = {{.reg = 2, .low_bit = 0, .high_bit = 2}}},
+    .crystal_14318 = {.piece_count = 1, .pieces = {{.reg = 0, .low_bit = 6, .high_bit = 6}}},
+    .ram_amount = {.piece_count = 1, .pieces = {{.reg = 0, .low_bit = 0, .high_bit = 1}}},
+    .hsync_off = {.piece_count = 1, .pieces = {{.reg = 0x1A, .low_bit = 6, .high_bit = 6}}},
+    .vsync_off = {.piece_count = 1, .pieces = {{.reg = 0x1A, .low_bit = 7, .high_bit = 7}}},
+    .rma_phase = {.piece_count = 1, .pieces = {{.reg = 0x38, .low_bit = 0, .high_bit = 2}}},
+    .pixel_format = {.piece_count = 1, .pieces = {{.reg = 0x28, .low_bit = 0, .high_bit = 1}}},
+    .offset = {.piece_count = 2,
+               .pieces = {{.reg = 0x13, .low_bit = 0, .high_bit = 7}, {.reg = 0x19, .low_bit = 5, .high_bit = 7}}},
 };

@@ -69,4 +69,21 @@ struct SimS3Fields {
 };
 extern const SimS3Fields sim_s3;
 
+// The NVIDIA Riva 128 and TNT (X.org nv and Linux rivafb register use,
+// envytools' register database). The CRT controller: bit 8 of the
+// horizontal values in CR2D, bit 10 of the vertical ones in CR25.
+extern const SimCrtcFields sim_nv_crtc;
+struct SimNvFields {
+    // On the four bytes of a 32-bit internal register, low byte first.
+    SimField pll_m, pll_n, pll_p;      // NV_PRAMDAC_*_COEFF 7..0, 15..8, 18..16
+    SimField crystal_14318;            // NV_PEXTDEV_BOOT_0 6: 14.31818 MHz, else 13.5 MHz
+    SimField ram_amount;               // NV_PFB_BOOT_0 1..0
+    // CRT controller registers.
+    SimField hsync_off, vsync_off;     // CR1A 6, 7
+    SimField rma_phase;                // CR38 2..0: 1 signature, 3 address, 5 data
+    SimField pixel_format;             // CR28 1..0: 0 VGA, 1 8 bits, 2 15/16 bits, 3 32 bits
+    SimField offset;                   // CR13 7..0, CR19 7..5: bytes per line / 8
+};
+extern const SimNvFields sim_nv;
+
 #endif

@@ -38,7 +38,7 @@ struct SimCardState {
     uint8_t class_index;   // 9x: n of the driver key DISPLAY\000n; 0xFF = none
 };
 
-enum { SIM_STATE_MAGIC = 0x4D495356, SIM_STATE_VERSION = 3 };
+enum { SIM_STATE_MAGIC = 0x4D495356, SIM_STATE_VERSION = 4 };
 
 struct SimState {
     uint32_t magic, version, size;
@@ -123,11 +123,19 @@ struct SimFamilyOps {
     SimDpms (*dpms)(int card);
     // The display driver's mode set: CRT timing, depth and pixel clock.
     void (*program_mode)(int card, const struct SimTiming* timing, int bits);
+    // I/O ports of the legacy range that the VGA core does not own (NULL: none);
+    // 1 when the family decodes the port.
+    int (*read_port)(int card, uint16_t port, uint8_t* value);
+    int (*write_port)(int card, uint16_t port, uint8_t value);
+    // simstate's raw clock-synthesizer lines, named as the chip's documents
+    // name the registers (NULL: none).
+    void (*print_raw)(FILE* out, int card);
 };
 
 const SimFamilyOps* SimCardOps(int card);
 extern const SimFamilyOps sim_vga_ops;
 extern const SimFamilyOps sim_s3_ops;
+extern const SimFamilyOps sim_riva_ops;
 
 // --- vga.cpp ---
 void VgaReset(int card);

@@ -38,6 +38,8 @@ void PrintCard(FILE* out, int card)
     PrintFile(out, "GR", s->vga.gr, 9);
     PrintFile(out, "AR", s->vga.ar, 21);
     PrintFile(out, "PCI", s->pci, 0x50);
+    const SimFamilyOps* ops = SimCardOps(card);
+    if (ops->print_raw) ops->print_raw(out, card);
 }
 
 }  // namespace

@@ -264,6 +264,27 @@ void ProgramMode(int card, const SimTiming* t, int bits)
     }
 }
 
+// The synthesizer registers under the names of S3's data books: MCLK and
+// DCLK value low (N and R) and high (M); the Savage3D's overflow bits in SR29.
+struct RawRegister {
+    uint8_t index;
+    const char* name;
+};
+const RawRegister raw_registers[] = {
+    {.index = 0x10, .name = "S3_SR10_MCLK_VALUE_LOW"},
+    {.index = 0x11, .name = "S3_SR11_MCLK_VALUE_HIGH"},
+    {.index = 0x12, .name = "S3_SR12_DCLK_VALUE_LOW"},
+    {.index = 0x13, .name = "S3_SR13_DCLK_VALUE_HIGH"},
+};
+const RawRegister savage_overflow = {.index = 0x29, .name = "S3_SR29_DCLK_OVERFLOW"};
+
+void PrintRaw(FILE* out, int card)
+{
+    const uint8_t* sr = Core(card)->sr;
+    for (const RawRegister& r : raw_registers) fprintf(out, "%s=%02X\n", r.name, sr[r.index]);
+    if (IsSavage(card)) fprintf(out, "%s=%02X\n", savage_overflow.name, sr[savage_overflow.index]);
+}
+
 }  // namespace
 
 const SimFamilyOps sim_s3_ops = {
@@ -281,4 +302,7 @@ const SimFamilyOps sim_s3_ops = {
     .refresh_hz = Refresh,
     .dpms = Dpms,
     .program_mode = ProgramMode,
+    .read_port = NULL,
+    .write_port = NULL,
+    .print_raw = PrintRaw,
 };

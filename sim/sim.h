@@ -68,6 +68,7 @@ struct SimCardConfig {
     // The card's own start-up mode; 0 = the machine's (secondary cards only;
     // the primary card always runs the desktop's mode).
     uint16_t start_width, start_height, start_bits, start_refresh;
+    uint32_t crystal_hz;  // NVIDIA: the reference crystal the straps report, 14318180 or 13500000
 };
 
 struct SimMachineConfig {
@@ -123,6 +124,11 @@ const SimMachineConfig* SimConfig();
 // protection or side effects (a test's back door).
 uint8_t SimReadRegister(int card, SimRegisterFile file, uint16_t index);
 void SimWriteRegister(int card, SimRegisterFile file, uint16_t index, uint8_t value);
+// The 32-bit internal registers of an NVIDIA card by their offset in the
+// register window, as the chip holds them (read-only straps included);
+// 0xFFFFFFFF for an offset or a card the model does not have.
+uint32_t SimReadInternal32(int card, uint32_t offset);
+void SimWriteInternal32(int card, uint32_t offset, uint32_t value);
 double SimPixelClockHz(int card);   // the dot clock: the DCLK synthesizer's output (MISC selects it)
 double SimMemoryClockHz(int card);  // the MCLK synthesizer's output
 int SimHTotal(int card);            // a line in character clocks, 0 when unknown

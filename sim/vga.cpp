@@ -120,6 +120,8 @@ uint8_t VgaRead(int card, uint16_t port)
 {
     SimVga* v = Core(card);
     const SimFamilyOps* ops = SimCardOps(card);
+    uint8_t value;
+    if (ops->read_port && ops->read_port(card, port, &value)) return value;
     if (IsStatusPort(card, port)) return ReadStatus1(card);
     if (IsCrtcIndexPort(card, port)) return v->crtc_index;
     if (IsCrtcIndexPort(card, port - 1)) return ops->read_cr(card, v->crtc_index);
@@ -146,6 +148,7 @@ void VgaWrite(int card, uint16_t port, uint8_t value)
 {
     SimVga* v = Core(card);
     const SimFamilyOps* ops = SimCardOps(card);
+    if (ops->write_port && ops->write_port(card, port, value)) return;
     if (IsStatusPort(card, port)) {
         v->feature = value;
         return;
@@ -221,4 +224,7 @@ const SimFamilyOps sim_vga_ops = {
     .refresh_hz = UnknownRefresh,
     .dpms = AlwaysOn,
     .program_mode = KeepRegisters,
+    .read_port = NULL,
+    .write_port = NULL,
+    .print_raw = NULL,
 };

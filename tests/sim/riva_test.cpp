@@ -1,0 +1,188 @@
+// The NVIDIA model: the extended-register locks, the real-mode access port
+// against the register window, the synthesizers and straps, DPMS, and the
+// display driver's mode set read back from the registers.
+#include <math.h>
+
+#include "modes.h"
+#include "sim_test.h"
+
+enum : uint16_t { TNT = 0x0020, RIVA128 = 0x0018 };
+const uint32_t MPLL = 0x680504, VPLL = 0x680508, STRAPS = 0x101000, PFB_BOOT = 0x100000;
+
+static void BootRiva(uint16_t device, int memory_mb = 16, uint32_t crystal_hz = 14318180, int windows = SIM_WINDOWS_98)
+{
+    SimCardConfig card = Card(device == TNT ? 0x10de : 0x12d2, device, device == TNT ? 1 : 0, device == TNT ? 0 : 10);
+    card.memory_mb = memory_mb;
+    card.crystal_hz = crystal_hz;
+    SimMachineConfig config = Machine(windows, {card});
+    config.start_bits = 32;
+    SimBoot(&config);
+}
+static uint32_t Bar0() { return SimCardBarAddress(0, 0); }
+static void Unlock(uint16_t device) { device == TNT ? WriteCr(0x1F, 0x57) : WriteSr(0x06, 0x57); }
+
+TEST(Riva, ExtendedCrtcOnlyBehindTheLock)
+{
+    const struct { uint16_t device, port; uint8_t index, relock, unlocked_reads; } cases[] = {
+        {TNT, 0x3D4, 0x1F, 0x75, 3},
+        {RIVA128, 0x3C4, 0x06, 0x00, 1},
+    };
+    for (const auto& c : cases) {
+        BootRiva(c.device, 4);
+        EXPECT_EQ(0, ReadIndexed(c.port, c.index)) << "locked after reset";
+        WriteCr(0x1A, 0xC0);
+        EXPECT_EQ(0, SimReadRegister(0, SIM_REG_CRTC, 0x1A)) << "a locked register ignores writes";
+        WriteIndexed(c.port, c.index, 0x57);
+        EXPECT_EQ(c.unlocked_reads, ReadIndexed(c.port, c.index));
+        WriteCr(0x1A, 0xC0);
+        EXPECT_EQ(0xC0, ReadCr(0x1A));
+        EXPECT_EQ(SIM_DPMS_OFF, SimDpmsState(0));
+        WriteIndexed(c.port, c.index, c.relock);
+        EXPECT_EQ(0, ReadIndexed(c.port, c.index));
+        EXPECT_EQ(0, ReadCr(0x1A)) << "a locked register reads 0";
+        EXPECT_EQ(SimReadRegister(0, SIM_REG_CRTC, 0x06), ReadCr(0x06)) << "the VGA's own do not lock";
+    }
+}
+
+// CR1A bit 6 stops the horizontal sync, bit 7 the vertical one (rivafb).
+TEST(Riva, DpmsFromTheSyncBits)
+{
+    BootRiva(TNT);
+    Unlock(TNT);
+    const struct { uint8_t cr1a; SimDpms state; } cases[] = {
+        {0x3F, SIM_DPMS_ON}, {0x40, SIM_DPMS_STANDBY}, {0x80, SIM_DPMS_SUSPEND}, {0xC0, SIM_DPMS_OFF}};
+    for (const auto& c : cases) {
+        WriteCr(0x1A, c.cr1a);
+        EXPECT_EQ(c.state, SimDpmsState(0)) << std::hex << (int)c.cr1a;
+    }
+}
+
+// The port pair and the window reach the same registers, from the program's
+// I/O instructions and through the NT kernel device's dword requests.
+static HANDLE nt_device;
+static void OutDword(uint16_t port, uint32_t value)
+{
+    if (!nt_device) return MachineOutDword(port, value);
+    uint32_t in[2] = {port, value};
+    DWORD got;
+    ASSERT_TRUE(MachineDeviceRequest(nt_device, 0x9C40A448, in, 8, NULL, 0, &got));
+}
+static uint32_t InDword(uint16_t port)
+{
+    if (!nt_device) return MachineInDword(port);
+    uint32_t in = port, out = 0xDEADBEEF;
+    DWORD got = 0;
+    EXPECT_TRUE(MachineDeviceRequest(nt_device, 0x9C406408, &in, 4, &out, 4, &got));
+    EXPECT_EQ(4u, got);
+    return out;
+}
+static void RmaWrite(uint32_t offset, uint32_t value)
+{
+    WriteCr(0x38, 0xFB);  // bits 7..3 are no part of the phase
+    ASSERT_NO_FATAL_FAILURE(OutDword(0x3D0, offset));
+    WriteCr(0x38, 0xFD);
+    ASSERT_NO_FATAL_FAILURE(OutDword(0x3D0, value));
+}
+static uint32_t RmaRead(uint32_t offset)
+{
+    WriteCr(0x38, 0x03);
+    OutDword(0x3D0, offset);
+    WriteCr(0x38, 0x05);
+    return InDword(0x3D0);
+}
+
+TEST(Riva, RealModeAccessMatchesTheWindow)
+{
+    for (int windows : {SIM_WINDOWS_98, SIM_WINDOWS_NT4}) {
+        BootRiva(TNT, 16, 14318180, windows);
+        nt_device = windows == SIM_WINDOWS_NT4
+                        ? MachineOpenDevice("\\\\.\\Zentra", GENERIC_READ | GENERIC_WRITE,
+                                            FILE_SHARE_READ | FILE_SHARE_WRITE, OPEN_EXISTING, 0)
+                        : NULL;
+        Unlock(TNT);
+        ASSERT_NO_FATAL_FAILURE(RmaWrite(MPLL, 0x12345678));
+        EXPECT_EQ(0x12345678u, MachineReadDword(Bar0() + MPLL)) << windows;
+        MachineWriteDword(Bar0() + VPLL, 0x0003A50C);
+        EXPECT_EQ(0x0003A50Cu, RmaRead(VPLL)) << windows;
+        EXPECT_EQ(SimReadInternal32(0, STRAPS), RmaRead(STRAPS)) << windows;
+        WriteCr(0x38, 0x01);
+        EXPECT_EQ(0x2B16D065u, InDword(0x3D0)) << "the signature (envytools)";
+        // A dword lands when its last lane does.
+        WriteCr(0x38, 0x05);
+        MachineOutByte(0x3D0, 0x99);
+        EXPECT_EQ(0x0003A50Cu, SimReadInternal32(0, VPLL));
+        if (nt_device) MachineCloseDevice(nt_device);
+        nt_device = NULL;
+    }
+}
+
+// 0x00018C0A: N = 140, M = 10, P = 1; the strap's bit 6 picks the crystal.
+TEST(Riva, SynthesizersStrapsAndMemorySize)
+{
+    const struct { uint16_t device; int mb; uint32_t crystal; double mclk_hz; int code; } cases[] = {
+        {TNT, 16, 14318180, 100227260, 3},
+        {TNT, 2, 13500000, 94500000, 0},  // the program's table; public tables read 0 as 32 MB
+        {RIVA128, 4, 14318180, 100227260, 2},
+        {RIVA128, 8, 14318180, 100227260, 0},
+    };
+    for (const auto& c : cases) {
+        BootRiva(c.device, c.mb, c.crystal);
+        SimWriteInternal32(0, MPLL, 0x00018C0A);
+        EXPECT_NEAR(c.mclk_hz, SimMemoryClockHz(0), 1) << c.crystal;
+        EXPECT_EQ(c.crystal != 13500000, (MachineReadDword(Bar0() + STRAPS) >> 6) & 1);
+        EXPECT_EQ(c.code, (int)(MachineReadDword(Bar0() + PFB_BOOT) & 3)) << c.mb;
+        MachineWriteDword(Bar0() + STRAPS, 0);
+        EXPECT_EQ(c.crystal != 13500000, (SimReadInternal32(0, STRAPS) >> 6) & 1) << "the straps are read-only";
+    }
+}
+
+// The driver's mode set, read back from CR00/CR2D, CR06/CR07/CR25 and the
+// VPLL, runs within 1 Hz of the timing's exact rate with either crystal.
+TEST(Riva, DmtModesRunAtTheirRates)
+{
+    const struct { uint16_t device; uint32_t crystal; int w, h, hz; } cases[] = {
+        {TNT, 14318180, 640, 480, 60},   {TNT, 14318180, 1024, 768, 85}, {TNT, 13500000, 1280, 1024, 85},
+        {RIVA128, 14318180, 800, 600, 72}, {RIVA128, 13500000, 1024, 768, 70},
+    };
+    for (const auto& c : cases) {
+        BootRiva(c.device, 8, c.crystal, SIM_WINDOWS_NT4);
+        ASSERT_TRUE(SimSetCardMode(0, c.w, c.h, 8, c.hz)) << c.w << "x" << c.h << "@" << c.hz;
+        const SimTiming* t = SimFindTiming(c.w, c.h, c.hz, false);
+        EXPECT_EQ(t->htotal / 8, SimHTotal(0));
+        EXPECT_EQ(t->vtotal, SimVTotal(0));
+        EXPECT_NEAR(SimTimingFrameRate(t), SimRefreshHz(0), 1.0) << c.w << "x" << c.h << "@" << c.hz;
+        SimWriteRegister(0, SIM_REG_CRTC, 0x2D, 0x01);
+        SimWriteRegister(0, SIM_REG_CRTC, 0x25, SimReadRegister(0, SIM_REG_CRTC, 0x25) ^ 0x01);
+        EXPECT_EQ(t->htotal / 8 + 256, SimHTotal(0)) << "CR2D bit 0 is bit 8 of the total";
+        EXPECT_EQ(((t->vtotal - 2) ^ 1024) + 2, SimVTotal(0)) << "CR25 bit 0 is bit 10";
+    }
+}
+
+static std::string PrintedState()
+{
+    std::string text;
+    FILE* f = tmpfile();
+    if (!f) return text;
+    SimPrintState(f);
+    rewind(f);
+    char buffer[4096];
+    for (size_t n; (n = fread(buffer, 1, sizeof buffer, f)) > 0;) text.append(buffer, n);
+    fclose(f);
+    return text;
+}
+
+// simstate names the synthesizer registers as the chips' documents do.
+TEST(Riva, SimstateNamesTheRawRegisters)
+{
+    BootRiva(TNT);
+    SimWriteInternal32(0, MPLL, 0x00018C0A);
+    std::string text = PrintedState();
+    for (const char* line : {"\nNV_PRAMDAC_MPLL_COEFF=00018C0A\n", "\nNV_PEXTDEV_BOOT_0=00000040\n",
+                             "\nNV_PFB_BOOT_0=00000003\n", "\nNV_PRAMDAC_VPLL_COEFF="})
+        EXPECT_NE(std::string::npos, text.find(line)) << line;
+    BootWith(SIM_WINDOWS_98, 0x8A20);
+    SimWriteRegister(0, SIM_REG_SEQUENCER, 0x12, 0x46);
+    text = PrintedState();
+    EXPECT_NE(std::string::npos, text.find("\nS3_SR12_DCLK_VALUE_LOW=46\nS3_SR13_DCLK_VALUE_HIGH="));
+    EXPECT_NE(std::string::npos, text.find("\nS3_SR29_DCLK_OVERFLOW="));
+}
