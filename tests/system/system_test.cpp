@@ -263,19 +263,19 @@ TEST_F(SystemTest, RivaTntMemoryClockThroughThePerformancePage)
         HWND question = ShownOtherThan(panel, "#32770", sheet);
         ASSERT_TRUE(question != NULL) << "no question";
         EXPECT_NEAR(before + 10, CardMhz(panel), 4);
-        EXPECT_EQ("", ReadRegistryRaw(HKEY_LOCAL_MACHINE, tnt_key, "mclk")) << "stored before the answer";
+        EXPECT_STREQ("", ReadRegistryRaw(HKEY_LOCAL_MACHINE, tnt_key, "mclk").c_str()) << "stored before the answer";
         PostMessageA(question, WM_COMMAND, answer, 0);
         for (DWORD start = GetTickCount(); IsWindow(question) && GetTickCount() - start < 10000;) Sleep(20);
         panel.Send(WM_NULL, 0);
     };
     apply(IDCANCEL);
     EXPECT_NEAR(before, CardMhz(panel), 1);
-    EXPECT_EQ(std::to_string(before), ReadRegistryRaw(HKEY_LOCAL_MACHINE, tnt_key, "mclk"));
-    RegDeleteKeyValueA(HKEY_LOCAL_MACHINE, tnt_key, "mclk");
+    EXPECT_EQ(std::to_string(before), ReadRegistryRaw(HKEY_LOCAL_MACHINE, tnt_key, "mclk").c_str());
+    ClearSettingsStore();
     apply(IDOK);
     const int kept = CardMhz(panel);
     EXPECT_NEAR(before + 10, kept, 4);
-    EXPECT_EQ(std::to_string(before + 10), ReadRegistryRaw(HKEY_LOCAL_MACHINE, tnt_key, "mclk"));
+    EXPECT_EQ(std::to_string(before + 10), ReadRegistryRaw(HKEY_LOCAL_MACHINE, tnt_key, "mclk").c_str());
     panel.process.Kill();
 
     // A reboot resets the card; only "/A" sets the stored clock again.
