@@ -27,6 +27,7 @@ static const char run_key[] = "SOFTWARE\\MICROSOFT\\WINDOWS\\CURRENTVERSION\\RUN
 static const char run_value[] = "quorvel";
 static const char autorun_switch[] = " /A";
 static const char value_indent[] = "              ";
+static const char dll_suffix[] = ".dll";
 
 static HWND animation;
 
@@ -184,7 +185,8 @@ static bool ListedDisplayDll(char* name, size_t size)
         char device[sizeof mode.dmDeviceName + 1];
         memcpy(device, mode.dmDeviceName, sizeof mode.dmDeviceName);
         device[sizeof mode.dmDeviceName] = 0;
-        return device[0] && FormatText(name, size, "%s.dll", device) == (int)TextLength(device) + 4;
+        return device[0] && FormatText(name, size, "%s%s", device, dll_suffix) ==
+                                (int)(TextLength(device) + sizeof dll_suffix - 1);
     }
 }
 

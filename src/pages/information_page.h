@@ -23,7 +23,7 @@ struct InformationFacts {
     char driver_version[FILE_VERSION_SIZE];
     char monitor_label[MONITOR_LABEL_SIZE];
     char monitor_name[MONITOR_NAME_SIZE];
-    uint64_t physical_bytes;
+    size_t physical_bytes;
     int memory_load;  // percent; Windows NT's is not shown
     char ddraw_version[FILE_VERSION_SIZE];
     char d3d_version[FILE_VERSION_SIZE];

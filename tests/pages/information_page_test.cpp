@@ -240,9 +240,9 @@ TEST(InformationPage, StartUpBoxAndRebuilds)
         EXPECT_EQ(ours, RunEntry("quorvel"));
         EXPECT_EQ("Current Setting :|~1024x768--32 bits, 85 Hz", current_set(sheet));
         for (uint32_t stale : {0u, (uint32_t)ADAPTER_INFO_STALE}) {
+            PropSheet_SetCurSel(sheet, NULL, PAGE_DESKTOP);
             CurrentAdapter()->refresh_hz = stale ? 72 : 60;
             CurrentAdapter()->flags |= stale;
-            PropSheet_SetCurSel(sheet, NULL, PAGE_DESKTOP);
             PropSheet_SetCurSel(sheet, NULL, PAGE_INFORMATION);
             EXPECT_EQ(stale ? "Current Setting :|~1024x768--32 bits, 72 Hz" : "Current Setting :|~1024x768--32 bits, 85 Hz",
                       current_set(sheet));
