@@ -28,6 +28,16 @@ target_include_directories(vistrel_sim PUBLIC ${VISTREL_ROOT}/sim ${VISTREL_ROOT
 target_compile_options(vistrel_sim PRIVATE -Wall -Wextra -Wno-unused-parameter -Wno-cast-function-type)
 target_link_libraries(vistrel_sim PUBLIC ${VISTREL_SYSTEM_LIBS})
 
+# A DLL of nothing but a version resource, into folder.
+function(vistrel_version_dll name source folder)
+  add_library(${name} SHARED ${source})
+  set_target_properties(${name} PROPERTIES LINKER_LANGUAGE C PREFIX "" RUNTIME_OUTPUT_DIRECTORY ${folder})
+  target_link_options(${name} PRIVATE -nostdlib -Wl,-e,0)
+endfunction()
+# The display driver file the simulated installation has; the machine copies
+# it from beside the running program into Windows' folders at boot.
+vistrel_version_dll(simdriver ${VISTREL_ROOT}/sim/display_driver.rc ${SIM_DIR})
+
 add_executable(vistrel-sim WIN32 ${VISTREL_ROOT}/src/shell/winmain.cpp ${VISTREL_ROOT}/sim/boot_description.cpp
                ${VISTREL_ROOT}/resources/vistrel.rc)
 target_include_directories(vistrel-sim PRIVATE ${VISTREL_ROOT}/src ${VISTREL_ROOT}/sim ${VISTREL_ROOT}/resources)
@@ -35,6 +45,7 @@ target_compile_options(vistrel-sim PRIVATE $<$<COMPILE_LANGUAGE:CXX>:${VISTREL_P
 target_link_options(vistrel-sim PRIVATE ${VISTREL_STATIC_RUNTIME})
 # The boot object comes first so that the machine is up before the program runs.
 target_link_libraries(vistrel-sim PRIVATE vistrel_core vistrel_sim)
+add_dependencies(vistrel-sim simdriver)
 set_target_properties(vistrel-sim PROPERTIES RUNTIME_OUTPUT_DIRECTORY ${SIM_DIR})
 
 add_executable(simstate ${VISTREL_ROOT}/sim/simstate.cpp)
@@ -94,11 +105,11 @@ function(vistrel_add_test name folder)
   set_tests_properties(${name} PROPERTIES TIMEOUT ${T_TIMEOUT} ENVIRONMENT "VISTREL_SIM_DIR=${SIM_DIR}")
 endfunction()
 
-# Test executables find HookKeep.dll beside them.
+# Test executables find HookKeep.dll and the machine's driver file beside them.
 add_custom_target(test-runtime ALL
   COMMAND ${CMAKE_COMMAND} -E make_directory ${TEST_DIR}
-  COMMAND ${CMAKE_COMMAND} -E copy $<TARGET_FILE:HookKeep> ${TEST_DIR}
-  DEPENDS HookKeep)
+  COMMAND ${CMAKE_COMMAND} -E copy $<TARGET_FILE:HookKeep> $<TARGET_FILE:simdriver> ${TEST_DIR}
+  DEPENDS HookKeep simdriver)
 
 include(${VISTREL_ROOT}/tests/tests.cmake)
 

@@ -18,6 +18,7 @@ const char class_root[] = "System\\CurrentControlSet\\Services\\Class";
 const char config_manager[] = "Config Manager\\Enum";
 const char resource_map[] = "HARDWARE\\RESOURCEMAP\\VIDEO";
 const char device_map[] = "HARDWARE\\DEVICEMAP\\VIDEO";
+const char driver_stand_in[] = "simdriver.dll";
 
 struct RootName {
     HKEY root;
@@ -694,6 +695,26 @@ int RegistryReadDisplaySettings(SimDriverMode* mode)
     return ReadDefaultSettings(HKEY_LOCAL_MACHINE, device, mode);
 }
 
+// Each card's display driver file where its Windows keeps it (what the
+// driver key's "drv" or the service's "ImagePath" names): a copy of the
+// versioned stand-in built beside the running program, when it is there.
+static void InstallDriverFiles()
+{
+    char source[MAX_PATH], folder[MAX_PATH], target[MAX_PATH + 80];
+    DWORD length = GetModuleFileNameA(NULL, source, sizeof source);
+    char* slash = length < sizeof source ? strrchr(source, '\\') : NULL;
+    if (!slash || (size_t)(slash - source) + sizeof driver_stand_in >= sizeof source) return;
+    strcpy(slash + 1, driver_stand_in);
+    UINT folder_length = IsNt() ? GetWindowsDirectoryA(folder, sizeof folder) : GetSystemDirectoryA(folder, sizeof folder);
+    if (!folder_length || folder_length >= sizeof folder) return;
+    for (int card = 0; card < sim->config.card_count; card++) {
+        if (!sim->config.cards[card].vendor_id) continue;
+        if (IsNt()) snprintf(target, sizeof target, "%s\\System32\\drivers\\%s.sys", folder, ServiceName(card));
+        else snprintf(target, sizeof target, "%s\\%s", folder, SimCardChip(card)->driver_file);
+        CopyFileA(source, target, FALSE);
+    }
+}
+
 void RegistrySeedMachine()
 {
     DeleteEarlierSeeds();
@@ -704,6 +725,7 @@ void RegistrySeedMachine()
     SetValue(HKEY_LOCAL_MACHINE, marker_key, "Seeded", REG_MULTI_SZ, seeded, (DWORD)seeded_used + 1);
     SetText(HKEY_LOCAL_MACHINE, marker_key, "Machine", sim->identity);
     CloseOpenKey();
+    InstallDriverFiles();
 }
 
 void RegistrySeedVolatile()

@@ -69,6 +69,13 @@ vistrel_test(pages)
 target_sources(test-pages PRIVATE ${VISTREL_ROOT}/resources/vistrel.rc)
 target_compile_definitions(test-pages PRIVATE VISTREL_TEST_DATA="${VISTREL_ROOT}/tests/data"
                            VISTREL_RESOURCES="${VISTREL_ROOT}/resources")
+# Files with nothing but a version resource, named by the language blocks of strings they have.
+vistrel_version_dll(version-ansi-unicode ${VISTREL_ROOT}/tests/data/version_only.rc ${TEST_DIR})
+target_compile_definitions(version-ansi-unicode PRIVATE ANSI_BLOCK UNICODE_BLOCK)
+vistrel_version_dll(version-unicode ${VISTREL_ROOT}/tests/data/version_only.rc ${TEST_DIR})
+target_compile_definitions(version-unicode PRIVATE UNICODE_BLOCK)
+vistrel_version_dll(version-none ${VISTREL_ROOT}/tests/data/version_only.rc ${TEST_DIR})
+add_dependencies(test-pages version-ansi-unicode version-unicode version-none test-runtime)
 vistrel_add_test(pages pages)
 
 # loupe.exe's command line and screen part and dxprobe.exe's lines, linked

@@ -19,7 +19,6 @@ static const char nt_primary_raw[] = "\\Device\\Video0.Raw";
 static const char nt_services[] = "System\\CurrentControlSet\\Services\\";
 static const char nt_bits_value[] = "DefaultSettings.BitsPerPel";
 enum {
-    VALUE_TEXT_SIZE = 80,
     KEY_PATH_SIZE = DRIVER_KEY_SIZE + 64,
     SERVICE_NAME_SIZE = 80,
     HARDWARE_KEY_SIZE = 120,
@@ -155,10 +154,10 @@ int DriverImageName(char* out)
     if (platform == PLATFORM_NT) {
         const char* last = FindLastChar(path, '\\');
         if (last) path[last - path] = 0;
-        ok = ReadRegistryText(HKEY_LOCAL_MACHINE, path, "imagepath", out, VALUE_TEXT_SIZE);
+        ok = ReadRegistryText(HKEY_LOCAL_MACHINE, path, "imagepath", out, DRIVER_IMAGE_SIZE);
     } else {
         ok = AppendText(path, sizeof path, "\\DEFAULT") &&
-             ReadRegistryText(HKEY_LOCAL_MACHINE, path, "drv", out, VALUE_TEXT_SIZE);
+             ReadRegistryText(HKEY_LOCAL_MACHINE, path, "drv", out, DRIVER_IMAGE_SIZE);
     }
     if (!ok) out[0] = 0;
     return ok ? 1 : -1;

@@ -5,7 +5,7 @@
 
 #include <stdint.h>
 
-enum { DRIVER_KEY_SIZE = 120 };
+enum { DRIVER_KEY_SIZE = 120, DRIVER_IMAGE_SIZE = 80 };
 
 // The current adapter's display driver key below HKEY_LOCAL_MACHINE: 1, or -1.
 int FindDriverKey(char* out);
@@ -18,7 +18,8 @@ int DriverKeyValue(const char* subkey, const char* name, void* buffer, uint32_t 
 // ReleaseDriverKey skip finding it again: 1, or -1 (reads then find it).
 int HoldDriverKey();
 void ReleaseDriverKey();
-// The display driver's file: NT "imagepath" of its service, 9x "drv".
+// The display driver's file into DRIVER_IMAGE_SIZE bytes: NT "imagepath" of
+// its service, 9x "drv".
 int DriverImageName(char* out);
 // NT: the primary display's depth from its service key, telling 15 from 16.
 int NtDefaultBits();

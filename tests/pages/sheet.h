@@ -11,6 +11,8 @@
 bool RunSheet(int requested_page, std::function<void(HWND sheet)> inside, HWND owner = NULL);
 HWND Page(HWND sheet);
 bool Enabled(HWND window, int id);
+// Clicks a button of the current page.
+void Click(HWND sheet, int id);
 extern const int apply_button;
 // Presses Apply and lets the sheet handle the press before it returns.
 void Apply(HWND sheet);
