@@ -108,7 +108,7 @@ struct Panel {
     }
     // Sets a rate 15 Hz above all Windows lists for the running mode, which
     // only the pixel clock reaches, offered by the chip file; returns it.
-    int SetExtendedRate(const char* section)
+    int SetExtendedRate(const char* section, const char* key = card_key)
     {
         DEVMODEA m = Screen();
         std::vector<int> os = QueryRates(m.dmPelsWidth, m.dmPelsHeight, m.dmBitsPerPel);
@@ -118,7 +118,7 @@ struct Panel {
         EXPECT_EQ(1, Send(msg_set_refresh, extended));
         EXPECT_NEAR(extended, RefreshHz(), 2.0);
         EXPECT_EQ(extended, (int)Send(msg_get_refresh, 0));
-        EXPECT_EQ(std::to_string(extended), ReadRegistryRaw(HKEY_LOCAL_MACHINE, card_key, "refresh").c_str());
+        EXPECT_EQ(std::to_string(extended), ReadRegistryRaw(HKEY_LOCAL_MACHINE, key, "refresh").c_str());
         return extended;
     }
     std::string folder;
@@ -250,6 +250,8 @@ TEST_F(SystemTest, RivaTntMemoryClockThroughThePerformancePage)
     HWND w = panel.WaitWindow();
     ASSERT_TRUE(w);
     EXPECT_NEAR(panel.RefreshHz(), (double)panel.Send(msg_get_refresh, 0), 1.0);
+    panel.SetExtendedRate("CHIP0020_95E", tnt_key);
+    ClearSettingsStore();
     const int before = CardMhz(panel);
 
     PostMessageA(w, WM_COMMAND, performance_command, 0);

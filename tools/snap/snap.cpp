@@ -5,7 +5,8 @@
 //
 //   snap.exe <out folder> <machine folder> <wine version> <scenario>
 //   scenarios: single (one card, every window), nt (menu, Desktop, Monitor),
-//              dual (two cards: menu, the second card's Desktop page), panning
+//              dual (two cards: menu, the second card's Desktop page), panning,
+//              tnt (a Riva TNT: menu, Information, Performance)
 #include <windows.h>
 #include <commctrl.h>
 #include <prsht.h>
@@ -377,6 +378,32 @@ void Single(HWND main)
     ExitQuestion(main, true);
 }
 
+// A Riva TNT on the AGP bus: its menu, and the pages only it fills.
+void Tnt(HWND main)
+{
+    HWND menu = OpenMenu(main);
+    if (!Check(menu != NULL, "the tray icon opens no menu")) return;
+    Settle(menu);
+    Photograph("tnt-menu", WithTaskbar(Box(menu)), "The tray menu of a Riva TNT: a Performance entry for its memory clock");
+    Key(menu, VK_ESCAPE);
+    WaitGone(menu);
+    PostMessageA(main, WM_COMMAND, first_page_command, 0);
+    HWND sheet = Shown("#32770");
+    if (!Check(sheet != NULL, "TNT: no sheet")) return;
+    HWND page = ShowPage(sheet, 1);
+    std::vector<std::string> info = ListLines(Control(page, INFO_LIST));
+    if (Check(Contains(info, "AGP 2x") && Contains(info, "16.0 MB") && Contains(info, "MHz"),
+              "TNT Information: no AGP 2x, 16.0 MB or memory clock line"))
+        Photograph("tnt-information", Around(Box(sheet), 8), "Information page of a Riva TNT: AGP 2x, 16 MB, its memory clock");
+    page = ShowPage(sheet, 3);
+    std::string clock = Text(Control(page, PERF_VALUE));
+    if (Check(Maximum(page, PERF_SLIDER) == 133 && Position(page, PERF_SLIDER) == atoi(clock.c_str()),
+              "TNT Performance: the slider does not stand at " + clock + " of 90..133"))
+        Photograph("tnt-performance", Around(Box(sheet), 8), "Performance page: the TNT's memory clock, 90 to 133 MHz");
+    CloseSheet(sheet);
+    ExitQuestion(main, false);
+}
+
 void Nt(HWND main)
 {
     HWND menu = OpenMenu(main);
@@ -460,6 +487,7 @@ int main(int argc, char** argv)
         else if (scenario == "single") Single(main);
         else if (scenario == "nt") Nt(main);
         else if (scenario == "dual") Dual(main);
+        else if (scenario == "tnt") Tnt(main);
         else Fail("unknown scenario " + scenario);
     }
     if (Running()) TerminateProcess(panel.hProcess, 1);
