@@ -102,6 +102,9 @@ const SimFamilyOps* SimCardOps(int card)
     switch (SimCardChip(card)->family) {
     case SIM_FAMILY_S3: return &sim_s3_ops;
     case SIM_FAMILY_NVIDIA: return &sim_riva_ops;
+    case SIM_FAMILY_BANSHEE: return &sim_banshee_ops;
+    case SIM_FAMILY_I740: return &sim_i740_ops;
+    case SIM_FAMILY_PERMEDIA: return &sim_permedia_ops;
     default: return &sim_vga_ops;
     }
 }

@@ -178,6 +178,19 @@ void SimWriteRegister(int card, SimRegisterFile file, uint16_t index, uint8_t va
     }
 }
 
+uint32_t SimReadInternal32(int card, uint32_t offset)
+{
+    uint32_t value;
+    const SimFamilyOps* ops = SimCardValid(card) ? SimCardOps(card) : NULL;
+    return ops && ops->read_internal32 && ops->read_internal32(card, offset, &value) ? value : 0xFFFFFFFF;
+}
+
+void SimWriteInternal32(int card, uint32_t offset, uint32_t value)
+{
+    const SimFamilyOps* ops = SimCardValid(card) ? SimCardOps(card) : NULL;
+    if (ops && ops->write_internal32) ops->write_internal32(card, offset, value);
+}
+
 double SimPixelClockHz(int card) { return SimCardValid(card) ? SimCardOps(card)->pixel_clock_hz(card) : 0; }
 double SimMemoryClockHz(int card) { return SimCardValid(card) ? SimCardOps(card)->memory_clock_hz(card) : 0; }
 int SimHTotal(int card) { return SimCardValid(card) ? SimCardOps(card)->htotal(card) : 0; }

@@ -130,12 +130,28 @@ struct SimFamilyOps {
     // simstate's raw clock-synthesizer lines, named as the chip's documents
     // name the registers (NULL: none).
     void (*print_raw)(FILE* out, int card);
+    // The family's 32-bit registers by their offset in the register window,
+    // as the chip holds them (tests' back door; NULL: none). 1 when the
+    // family has a register there.
+    int (*read_internal32)(int card, uint32_t offset, uint32_t* value);
+    int (*write_internal32)(int card, uint32_t offset, uint32_t value);
 };
 
 const SimFamilyOps* SimCardOps(int card);
 extern const SimFamilyOps sim_vga_ops;
 extern const SimFamilyOps sim_s3_ops;
 extern const SimFamilyOps sim_riva_ops;
+extern const SimFamilyOps sim_banshee_ops;
+extern const SimFamilyOps sim_i740_ops;
+extern const SimFamilyOps sim_permedia_ops;
+
+// --- permedia.cpp: the display driver's timing list (9x registry) ---
+enum { SIM_PERMEDIA_RECORD_SIZE = 14 };
+// A timing record as the Permedia 2 display driver keeps it in
+// DEFAULT\TIMINGS\<w>,<h>: rate, second rate, horizontal total, front
+// porch, sync and back porch in characters of 8 pixels, vertical ones in
+// lines, each sync's polarity (1 = positive).
+void PermediaTimingRecord(const SimTiming* timing, uint8_t* record);
 
 // --- vga.cpp ---
 void VgaReset(int card);

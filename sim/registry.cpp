@@ -293,6 +293,32 @@ void SeedDisplayClass9x(int card)
     }
 }
 
+// The Permedia 2 display driver's own timing list: for each size, its
+// DMT timings as records "1", "2", ... of DEFAULT\TIMINGS\<w>,<h>; "1" is
+// the one the driver uses (the default rate), the others follow ascending.
+void SeedPermediaTimings9x(int card, const char* key)
+{
+    SimModeLimits limits = DisplayCardLimits(card);
+    for (int s = 0; s < sim_desktop_size_count; s++) {
+        int w = sim_desktop_sizes[s].width, h = sim_desktop_sizes[s].height;
+        uint16_t rates[SIM_MAX_RATES];
+        int n = SimModeRates(&limits, w, h, 8, rates);
+        if (!n) continue;
+        char sub[320], name[8];
+        snprintf(sub, sizeof sub, "%s\\DEFAULT\\TIMINGS\\%d,%d", key, w, h);
+        int first = SimDefaultRate(rates, n), number = 1;
+        for (int pass = 0; pass < 2; pass++) {
+            for (int i = 0; i < n; i++) {
+                if ((rates[i] == first) != (pass == 0)) continue;
+                uint8_t record[SIM_PERMEDIA_RECORD_SIZE];
+                PermediaTimingRecord(SimFindTiming(w, h, rates[i], false), record);
+                snprintf(name, sizeof name, "%d", number++);
+                SetValue(HKEY_LOCAL_MACHINE, sub, name, REG_BINARY, record, sizeof record);
+            }
+        }
+    }
+}
+
 void SeedEnum9x(int card)
 {
     const SimCardConfig* c = &sim->config.cards[card];
@@ -404,6 +430,11 @@ void SeedMachine9x()
         if (!sim->config.cards[card].vendor_id || !sim->config.cards[card].device_node) continue;
         sim->cards[card].class_index = (uint8_t)class_count++;
         SeedDisplayClass9x(card);
+        if (SimCardChip(card)->family == SIM_FAMILY_PERMEDIA) {
+            char key[256];
+            DriverKey9x(card, key, sizeof key);
+            SeedPermediaTimings9x(card, key);
+        }
         SeedEnum9x(card);
     }
     char path[200];

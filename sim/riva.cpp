@@ -297,21 +297,21 @@ void PrintRaw(FILE* out, int card)
     for (const NvRegister& r : registers) fprintf(out, "%s=%08X\n", r.name, Load(card, r.slot));
 }
 
-bool IsNv(int card) { return SimCardValid(card) && SimCardChip(card)->family == SIM_FAMILY_NVIDIA; }
+int ReadInternal32(int card, uint32_t offset, uint32_t* value)
+{
+    const NvRegister* r = FindRegister(offset);
+    if (r) *value = Load(card, r->slot);
+    return r != NULL;
+}
+
+int WriteInternal32(int card, uint32_t offset, uint32_t value)
+{
+    const NvRegister* r = FindRegister(offset);
+    if (r) Store(card, r->slot, value);
+    return r != NULL;
+}
 
 }  // namespace
-
-uint32_t SimReadInternal32(int card, uint32_t offset)
-{
-    const NvRegister* r = IsNv(card) ? FindRegister(offset) : NULL;
-    return r ? Load(card, r->slot) : 0xFFFFFFFF;
-}
-
-void SimWriteInternal32(int card, uint32_t offset, uint32_t value)
-{
-    const NvRegister* r = IsNv(card) ? FindRegister(offset) : NULL;
-    if (r) Store(card, r->slot, value);
-}
 
 const SimFamilyOps sim_riva_ops = {
     .reset = Reset,
@@ -331,4 +331,6 @@ const SimFamilyOps sim_riva_ops = {
     .read_port = ReadPort,
     .write_port = WritePort,
     .print_raw = PrintRaw,
+    .read_internal32 = ReadInternal32,
+    .write_internal32 = WriteInternal32,
 };

@@ -305,4 +305,6 @@ const SimFamilyOps sim_s3_ops = {
     .read_port = NULL,
     .write_port = NULL,
     .print_raw = PrintRaw,
+    .read_internal32 = NULL,
+    .write_internal32 = NULL,
 };

@@ -124,9 +124,9 @@ const SimMachineConfig* SimConfig();
 // protection or side effects (a test's back door).
 uint8_t SimReadRegister(int card, SimRegisterFile file, uint16_t index);
 void SimWriteRegister(int card, SimRegisterFile file, uint16_t index, uint8_t value);
-// The 32-bit internal registers of an NVIDIA card by their offset in the
-// register window, as the chip holds them (read-only straps included);
-// 0xFFFFFFFF for an offset or a card the model does not have.
+// The 32-bit registers of an NVIDIA, Banshee or Permedia 2 card by their
+// offset in the register window, as the chip holds them (read-only straps
+// included); 0xFFFFFFFF for an offset or a card the model does not have.
 uint32_t SimReadInternal32(int card, uint32_t offset);
 void SimWriteInternal32(int card, uint32_t offset, uint32_t value);
 double SimPixelClockHz(int card);   // the dot clock: the DCLK synthesizer's output (MISC selects it)

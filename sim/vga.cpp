@@ -227,4 +227,6 @@ const SimFamilyOps sim_vga_ops = {
     .read_port = NULL,
     .write_port = NULL,
     .print_raw = NULL,
+    .read_internal32 = NULL,
+    .write_internal32 = NULL,
 };

@@ -1,0 +1,79 @@
+// The i740 model: the XR index/data pair, the two clock sets chosen by the
+// MISC clock select, the memory clock choice, DPMS sync select, and the
+// display driver's mode set read back through CR30/CR35.
+#include "modes.h"
+#include "sim_test.h"
+
+static void BootI740(int windows = SIM_WINDOWS_98)
+{
+    SimMachineConfig config = Machine(windows, {Card(0x8086, 0x7800, 1, 0)});
+    config.start_bits = 32;
+    SimBoot(&config);
+}
+static void WriteXr(uint8_t index, uint8_t value) { WriteIndexed(0x3D6, index, value); }
+static uint8_t ReadXr(uint8_t index) { return ReadIndexed(0x3D6, index); }
+
+// f = 66.6667 MHz (/4 without divisor select bit 0) x 4 or 16 (bit 2) x
+// (M + 2) / ((N + 2) x 2^P), M and N with their bits 9..8 in XRC2/XRCA.
+TEST(I740, ClockSetsByTheClockSelect)
+{
+    const struct { uint8_t misc_select, base, m, n, high, divisor; double hz; } cases[] = {
+        {0, 0xC0, 25, 10, 0x00, 0x21, 150000075},  // M 25, N 10, P 2, loop by 4
+        {2, 0xC8, 25, 10, 0x00, 0x25, 600000300},  // loop by 16
+        {1, 0xC8, 25, 10, 0x00, 0x20, 37500019},   // the reference divided by 4
+        {3, 0xC8, 0, 0, 0x11, 0x01, 66666700 * 4.0 * 258 / 258},  // M 256, N 256
+    };
+    for (const auto& c : cases) {
+        BootI740();
+        WriteXr(c.base, c.m);
+        WriteXr(c.base + 1, c.n);
+        WriteXr(c.base + 2, c.high);
+        WriteXr(c.base + 3, c.divisor);
+        MachineOutByte(0x3C2, (uint8_t)(0xE3 | c.misc_select << 2));
+        EXPECT_NEAR(c.hz, SimPixelClockHz(0), 1) << std::hex << (int)c.base << " " << (int)c.divisor;
+        EXPECT_EQ(c.m, ReadXr(c.base));
+    }
+    const struct { uint8_t code; double hz; } memory[] = {{0, 66667000}, {1, 75000000}, {2, 88889000}, {3, 100000000}};
+    for (const auto& m : memory) {
+        WriteXr(0xCE, (uint8_t)(0xF0 | m.code));
+        EXPECT_NEAR(m.hz, SimMemoryClockHz(0), 1);
+    }
+}
+
+// XR61 bit 1 stops the horizontal sync, bit 3 the vertical one (i740fb).
+TEST(I740, DpmsFromTheSyncSelect)
+{
+    BootI740();
+    const struct { uint8_t xr61; SimDpms state; } cases[] = {
+        {0x00, SIM_DPMS_ON}, {0x03, SIM_DPMS_STANDBY}, {0x08, SIM_DPMS_SUSPEND}, {0x0B, SIM_DPMS_OFF}, {0x05, SIM_DPMS_ON}};
+    for (const auto& c : cases) {
+        WriteXr(0x61, c.xr61);
+        EXPECT_EQ(c.state, SimDpmsState(0)) << std::hex << (int)c.xr61;
+    }
+}
+
+// The XR pair is also reached in the register window at BAR1 + port.
+TEST(I740, DmtModesRunAtTheirRates)
+{
+    const struct { int w, h, hz, bits; } cases[] = {
+        {640, 480, 60, 8}, {800, 600, 72, 16}, {1024, 768, 85, 16}, {1280, 1024, 75, 8}};
+    for (const auto& c : cases) {
+        BootI740(SIM_WINDOWS_NT4);
+        ASSERT_TRUE(SimSetCardMode(0, c.w, c.h, c.bits, c.hz)) << c.w << "x" << c.h << "@" << c.hz;
+        const SimTiming* t = SimFindTiming(c.w, c.h, c.hz, false);
+        EXPECT_EQ(t->htotal / 8, SimHTotal(0));
+        EXPECT_EQ(t->vtotal, SimVTotal(0));
+        EXPECT_NEAR(SimTimingFrameRate(t), SimRefreshHz(0), 1.0) << c.w << "x" << c.h << "@" << c.hz;
+        EXPECT_EQ(8, (MachineInByte(0x3CC) & 0x0C)) << "clock select 2: set B";
+        SimWriteRegister(0, SIM_REG_CRTC, 0x35, 0x01);
+        SimWriteRegister(0, SIM_REG_CRTC, 0x30, SimReadRegister(0, SIM_REG_CRTC, 0x30) ^ 0x08);
+        EXPECT_EQ(t->htotal / 8 + 256, SimHTotal(0)) << "CR35 bit 0 is bit 8 of the total";
+        EXPECT_EQ(((t->vtotal - 2) ^ 2048) + 2, SimVTotal(0)) << "CR30 bit 3 is bit 11";
+    }
+    BootI740();
+    uint32_t window = SimCardBarAddress(0, 1);
+    MachineWriteByte(window + 0x3D6, 0x61);
+    MachineWriteByte(window + 0x3D7, 0x0B);
+    EXPECT_EQ(SIM_DPMS_OFF, SimDpmsState(0));
+    EXPECT_NE(std::string::npos, PrintedState().find("\nVCLK2_VCO_DIV_SEL="));
+}
