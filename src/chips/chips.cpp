@@ -7,10 +7,13 @@
 #include "base/state.h"
 #include "chips/riva.h"
 #include "chips/s3.h"
+#include "chips/trident.h"
 #include "chips/unsupported.h"
 
 #define RIVA_FAMILY .Dispatch = RivaDispatch, .SetPixelClock = RivaSetPixelClock, .GetPixelClock = RivaGetPixelClock
 #define S3_FAMILY .Dispatch = S3Dispatch, .SetPixelClock = S3SetPixelClock, .GetPixelClock = S3GetPixelClock
+#define TRIDENT_FAMILY \
+    .Dispatch = TridentDispatch, .SetPixelClock = TridentSetPixelClock, .GetPixelClock = TridentGetPixelClock
 #define UNSUPPORTED_FAMILY                                                            \
     .Dispatch = UnsupportedDispatch, .SetPixelClock = UnsupportedSetPixelClock, \
     .GetPixelClock = UnsupportedGetPixelClock
@@ -21,7 +24,7 @@ const ChipRow chip_table[CHIP_TABLE_ROWS] = {
     {.vendor_id = 0x10de, .device_id = 0x0020, RIVA_FAMILY},         // Riva TNT
     {.vendor_id = 0x8086, .device_id = 0x7800, UNSUPPORTED_FAMILY},  // i740
     {.vendor_id = 0x121a, .device_id = 0x0003, UNSUPPORTED_FAMILY},  // Voodoo Banshee
-    {.vendor_id = 0x1023, .device_id = 0x939a, UNSUPPORTED_FAMILY},  // Trident 939a
+    {.vendor_id = 0x1023, .device_id = 0x939a, TRIDENT_FAMILY},      // Trident 939a
     {.vendor_id = 0x5333, .device_id = 0x8a13, S3_FAMILY},           // Trio3D/2X
     {.vendor_id = 0x5333, .device_id = 0x8a20, S3_FAMILY},           // Savage3D
     {.vendor_id = 0x5333, .device_id = 0x8a21, S3_FAMILY},           // Savage3D/MV
