@@ -5,6 +5,7 @@
 #include "base/adapters.h"
 #include "base/module_reset.h"
 #include "base/state.h"
+#include "chips/et6000.h"
 #include "chips/riva.h"
 #include "chips/s3.h"
 #include "chips/trident.h"
@@ -12,6 +13,8 @@
 
 #define RIVA_FAMILY .Dispatch = RivaDispatch, .SetPixelClock = RivaSetPixelClock, .GetPixelClock = RivaGetPixelClock
 #define S3_FAMILY .Dispatch = S3Dispatch, .SetPixelClock = S3SetPixelClock, .GetPixelClock = S3GetPixelClock
+#define ET6000_FAMILY \
+    .Dispatch = Et6000Dispatch, .SetPixelClock = Et6000SetPixelClock, .GetPixelClock = Et6000GetPixelClock
 #define TRIDENT_FAMILY \
     .Dispatch = TridentDispatch, .SetPixelClock = TridentSetPixelClock, .GetPixelClock = TridentGetPixelClock
 #define UNSUPPORTED_FAMILY                                                            \
@@ -38,7 +41,7 @@ const ChipRow chip_table[CHIP_TABLE_ROWS] = {
     {.vendor_id = 0x104c, .device_id = 0x3d07, UNSUPPORTED_FAMILY},  // TI Permedia 2
     {.vendor_id = 0x3d3d, .device_id = 0x0007, UNSUPPORTED_FAMILY},  // Permedia 2
     {.vendor_id = 0x3d3d, .device_id = 0x0009, UNSUPPORTED_FAMILY},  // Permedia 2v
-    {.vendor_id = 0x100c, .device_id = 0x3208, UNSUPPORTED_FAMILY},  // ET6000
+    {.vendor_id = 0x100c, .device_id = 0x3208, ET6000_FAMILY},       // ET6000
 };
 
 const ChipRow* chip_rows = chip_table;
