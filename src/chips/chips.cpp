@@ -5,12 +5,21 @@
 #include "base/adapters.h"
 #include "base/module_reset.h"
 #include "base/state.h"
+#include "chips/et6000.h"
+#include "chips/permedia2.h"
 #include "chips/riva.h"
 #include "chips/s3.h"
+#include "chips/trident.h"
 #include "chips/unsupported.h"
 
 #define RIVA_FAMILY .Dispatch = RivaDispatch, .SetPixelClock = RivaSetPixelClock, .GetPixelClock = RivaGetPixelClock
 #define S3_FAMILY .Dispatch = S3Dispatch, .SetPixelClock = S3SetPixelClock, .GetPixelClock = S3GetPixelClock
+#define ET6000_FAMILY \
+    .Dispatch = Et6000Dispatch, .SetPixelClock = Et6000SetPixelClock, .GetPixelClock = Et6000GetPixelClock
+#define PERMEDIA2_FAMILY \
+    .Dispatch = Permedia2Dispatch, .SetPixelClock = Permedia2SetPixelClock, .GetPixelClock = Permedia2GetPixelClock
+#define TRIDENT_FAMILY \
+    .Dispatch = TridentDispatch, .SetPixelClock = TridentSetPixelClock, .GetPixelClock = TridentGetPixelClock
 #define UNSUPPORTED_FAMILY                                                            \
     .Dispatch = UnsupportedDispatch, .SetPixelClock = UnsupportedSetPixelClock, \
     .GetPixelClock = UnsupportedGetPixelClock
@@ -21,7 +30,7 @@ const ChipRow chip_table[CHIP_TABLE_ROWS] = {
     {.vendor_id = 0x10de, .device_id = 0x0020, RIVA_FAMILY},         // Riva TNT
     {.vendor_id = 0x8086, .device_id = 0x7800, UNSUPPORTED_FAMILY},  // i740
     {.vendor_id = 0x121a, .device_id = 0x0003, UNSUPPORTED_FAMILY},  // Voodoo Banshee
-    {.vendor_id = 0x1023, .device_id = 0x939a, UNSUPPORTED_FAMILY},  // Trident 939a
+    {.vendor_id = 0x1023, .device_id = 0x939a, TRIDENT_FAMILY},      // Trident 939a
     {.vendor_id = 0x5333, .device_id = 0x8a13, S3_FAMILY},           // Trio3D/2X
     {.vendor_id = 0x5333, .device_id = 0x8a20, S3_FAMILY},           // Savage3D
     {.vendor_id = 0x5333, .device_id = 0x8a21, S3_FAMILY},           // Savage3D/MV
@@ -32,10 +41,10 @@ const ChipRow chip_table[CHIP_TABLE_ROWS] = {
     {.vendor_id = 0x5333, .device_id = 0x8a10, S3_FAMILY},           // ViRGE/GX2
     {.vendor_id = 0x5333, .device_id = 0x8811, S3_FAMILY},           // Trio32/Trio64
     {.vendor_id = 0x5333, .device_id = 0x8901, S3_FAMILY},           // Trio64V2
-    {.vendor_id = 0x104c, .device_id = 0x3d07, UNSUPPORTED_FAMILY},  // TI Permedia 2
-    {.vendor_id = 0x3d3d, .device_id = 0x0007, UNSUPPORTED_FAMILY},  // Permedia 2
-    {.vendor_id = 0x3d3d, .device_id = 0x0009, UNSUPPORTED_FAMILY},  // Permedia 2v
-    {.vendor_id = 0x100c, .device_id = 0x3208, UNSUPPORTED_FAMILY},  // ET6000
+    {.vendor_id = 0x104c, .device_id = 0x3d07, PERMEDIA2_FAMILY},    // TI Permedia 2
+    {.vendor_id = 0x3d3d, .device_id = 0x0007, PERMEDIA2_FAMILY},    // Permedia 2
+    {.vendor_id = 0x3d3d, .device_id = 0x0009, PERMEDIA2_FAMILY},    // Permedia 2v
+    {.vendor_id = 0x100c, .device_id = 0x3208, ET6000_FAMILY},       // ET6000
 };
 
 const ChipRow* chip_rows = chip_table;
@@ -62,10 +71,12 @@ uint32_t chip_write_port(uint32_t port, uint32_t value)
 uint32_t chip_read_port(uint32_t port) { return Command(CMD_READ_PORT, port); }
 uint32_t chip_get_mem_size() { return Command(CMD_GET_MEM_SIZE); }
 
-uint32_t chip_prepare_mode(uint16_t width, uint16_t height, uint16_t bits, uint32_t refresh)
+uint32_t chip_prepare_mode(uint16_t width, uint16_t height, uint16_t bits, uint32_t refresh, ChipTiming* timing)
 {
-    ChipModeRecord mode = {width, height, bits, refresh};
-    return Command(CMD_PREPARE_MODE, (uintptr_t)&mode);
+    ChipModeRecord mode = {.width = width, .height = height, .bits_per_pixel = bits, .refresh_hz = refresh, .timing = {}};
+    uint32_t needs = Command(CMD_PREPARE_MODE, (uintptr_t)&mode);
+    if (timing) *timing = mode.timing;
+    return needs;
 }
 
 uint32_t chip_hide_page(uint32_t page) { return Command(CMD_HIDE_PAGE, page); }

@@ -37,8 +37,19 @@ enum ChipCommand : uint32_t {
 // Capability bits of CMD_INIT_CHIP, ORed into the adapter's flags.
 enum {
     CHIP_CAP_NO_ADJUST = 0x0001,
+    CHIP_CAP_UNCLAMPED_RATE = 0x0004,
     CHIP_CAP_NO_CLOCK_REFRESH = 0x0008,
     CHIP_CAP_AGP = 0x8000,
+};
+
+enum { CHIP_TIMING_SIZE = 14 };
+
+// A timing record for the head of the display driver's timing list of a
+// mode: the timings there move one place down first when the rate of the
+// list's first timing (byte 0) is below shift_above.
+struct ChipTiming {
+    const uint8_t* record;  // CHIP_TIMING_SIZE bytes
+    uint8_t shift_above;
 };
 
 // Argument of CMD_PREPARE_MODE, passed by address. The driver answers what
@@ -49,10 +60,12 @@ struct ChipModeRecord {
     uint16_t height;
     uint16_t bits_per_pixel;
     uint32_t refresh_hz;
+    ChipTiming timing;  // answered with PREPARE_TIMING
 };
 
 enum {
     PREPARE_REFRESH_KEY = 0x1,  // the 9x driver reads the rate from the mode's "RefreshRate"
+    PREPARE_TIMING = 0x2,       // and, once that is stored, the timing record from its list
 };
 
 typedef uint32_t (*ChipDispatchFn)(uint32_t command, uintptr_t argument);
@@ -82,8 +95,10 @@ uint32_t chip_get_char_width();
 uint32_t chip_write_port(uint32_t port, uint32_t value);
 uint32_t chip_read_port(uint32_t port);
 uint32_t chip_get_mem_size();
-// What the display driver must find before this mode is set (PREPARE_*).
-uint32_t chip_prepare_mode(uint16_t width, uint16_t height, uint16_t bits, uint32_t refresh);
+// What the display driver must find before this mode is set (PREPARE_*),
+// with the timing record in *timing when one is answered.
+uint32_t chip_prepare_mode(uint16_t width, uint16_t height, uint16_t bits, uint32_t refresh,
+                           ChipTiming* timing = nullptr);
 uint32_t chip_hide_page(uint32_t page);
 uint32_t chip_map_registers();
 uint32_t chip_get_mem_type();

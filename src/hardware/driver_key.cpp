@@ -130,6 +130,15 @@ static LONG OpenDriverSubkey(const char* subkey, int read, HKEY* key)
     return RegOpenKeyExA(HKEY_LOCAL_MACHINE, path, 0, read ? KEY_READ : KEY_WRITE, key);
 }
 
+int OpenDriverSubkeyForUpdate(const char* subkey, HKEY* key)
+{
+    char path[KEY_PATH_SIZE];
+    if (FindDriverKey(path) != 1 || !AppendText(path, sizeof path, subkey)) return -1;
+    LONG r = RegCreateKeyExA(HKEY_LOCAL_MACHINE, path, 0, NULL, REG_OPTION_NON_VOLATILE, KEY_READ | KEY_WRITE, NULL,
+                             key, NULL);
+    return r == ERROR_SUCCESS ? 1 : -1;
+}
+
 int DriverKeyValue(const char* subkey, const char* name, void* buffer, uint32_t size, uint32_t type, int read)
 {
     HKEY key;

@@ -3,6 +3,7 @@
 #ifndef VISTREL_DRIVER_KEY_H
 #define VISTREL_DRIVER_KEY_H
 
+#include <windows.h>
 #include <stdint.h>
 
 enum { DRIVER_KEY_SIZE = 120, DRIVER_IMAGE_SIZE = 80 };
@@ -14,6 +15,9 @@ int ReadDeviceNodeValue(const char* name, uint32_t* out);
 // Reads (read = 1) or writes a value of the display driver key with the
 // subkey text appended. 1, or -1 on any failure.
 int DriverKeyValue(const char* subkey, const char* name, void* buffer, uint32_t size, uint32_t type, int read);
+// Opens a subkey of the display driver key for reading and writing,
+// creating it when missing: 1, or -1.
+int OpenDriverSubkeyForUpdate(const char* subkey, HKEY* key);
 // Opens the driver key once so that the reads of DriverKeyValue until
 // ReleaseDriverKey skip finding it again: 1, or -1 (reads then find it).
 int HoldDriverKey();

@@ -12,6 +12,7 @@
 #include "modes/mode_keys.h"
 #include "modes/mode_list.h"
 #include "modes/position.h"
+#include "modes/timing_list.h"
 
 static_assert(sizeof(DEVMODEA) == 156, "the mode request of the standard size, no driver bytes");
 
@@ -53,8 +54,11 @@ static void BuildModeRequest(DEVMODEA* mode, DWORD mask, int width, int height, 
 // The display driver finds what the chip driver asks for before the switch.
 static void PrepareDisplayDriver(int width, int height, int bits, int frequency)
 {
-    uint32_t needs = chip_prepare_mode((uint16_t)width, (uint16_t)height, (uint16_t)bits, (uint32_t)frequency);
-    if (needs & PREPARE_REFRESH_KEY) ModeKeyRefresh(width, height, bits, 1, frequency);
+    ChipTiming timing = {};
+    uint32_t needs =
+        chip_prepare_mode((uint16_t)width, (uint16_t)height, (uint16_t)bits, (uint32_t)frequency, &timing);
+    if ((needs & PREPARE_REFRESH_KEY) && ModeKeyRefresh(width, height, bits, 1, frequency) != 1) return;
+    if (needs & PREPARE_TIMING) InstallTiming(width, height, &timing);
 }
 
 static void SaveMode(int refresh, int width, int height, int bits)

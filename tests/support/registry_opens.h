@@ -4,7 +4,7 @@
 #ifndef VISTREL_TEST_REGISTRY_OPENS_H
 #define VISTREL_TEST_REGISTRY_OPENS_H
 
-#include <windows.h>
+#include "support/import_slot.h"
 
 inline unsigned registry_opens;
 inline LONG(WINAPI* real_registry_open)(HKEY, LPCSTR, DWORD, REGSAM, PHKEY);
@@ -18,22 +18,10 @@ inline LONG WINAPI CountedRegistryOpen(HKEY root, LPCSTR path, DWORD options, RE
 // False when no slot of this program imports it.
 inline bool CountRegistryOpens()
 {
-    static bool counting;
-    if (counting) return true;
-    real_registry_open = (decltype(real_registry_open))GetProcAddress(GetModuleHandleA("advapi32.dll"), "RegOpenKeyExA");
-    BYTE* image = (BYTE*)GetModuleHandleA(NULL);
-    IMAGE_NT_HEADERS* nt = (IMAGE_NT_HEADERS*)(image + ((IMAGE_DOS_HEADER*)image)->e_lfanew);
-    IMAGE_DATA_DIRECTORY iat = nt->OptionalHeader.DataDirectory[IMAGE_DIRECTORY_ENTRY_IAT];
-    ULONG_PTR* slots = (ULONG_PTR*)(image + iat.VirtualAddress);
-    DWORD old;
-    VirtualProtect(slots, iat.Size, PAGE_READWRITE, &old);
-    for (DWORD i = 0; i < iat.Size / sizeof *slots; ++i) {
-        if (slots[i] != (ULONG_PTR)real_registry_open) continue;
-        slots[i] = (ULONG_PTR)CountedRegistryOpen;
-        counting = true;
-    }
-    VirtualProtect(slots, iat.Size, old, &old);
-    return counting;
+    if (real_registry_open) return true;
+    real_registry_open = (decltype(real_registry_open))RedirectImport("advapi32.dll", "RegOpenKeyExA",
+                                                                       (FARPROC)CountedRegistryOpen);
+    return real_registry_open != NULL;
 }
 
 #endif
