@@ -102,6 +102,7 @@ const SimFamilyOps* SimCardOps(int card)
     switch (SimCardChip(card)->family) {
     case SIM_FAMILY_S3: return &sim_s3_ops;
     case SIM_FAMILY_NVIDIA: return &sim_riva_ops;
+    case SIM_FAMILY_TRIDENT: return &sim_trident_ops;
     default: return &sim_vga_ops;
     }
 }

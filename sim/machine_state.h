@@ -136,6 +136,7 @@ const SimFamilyOps* SimCardOps(int card);
 extern const SimFamilyOps sim_vga_ops;
 extern const SimFamilyOps sim_s3_ops;
 extern const SimFamilyOps sim_riva_ops;
+extern const SimFamilyOps sim_trident_ops;
 
 // --- vga.cpp ---
 void VgaReset(int card);

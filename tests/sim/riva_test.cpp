@@ -158,19 +158,6 @@ TEST(Riva, DmtModesRunAtTheirRates)
     }
 }
 
-static std::string PrintedState()
-{
-    std::string text;
-    FILE* f = tmpfile();
-    if (!f) return text;
-    SimPrintState(f);
-    rewind(f);
-    char buffer[4096];
-    for (size_t n; (n = fread(buffer, 1, sizeof buffer, f)) > 0;) text.append(buffer, n);
-    fclose(f);
-    return text;
-}
-
 // simstate names the synthesizer registers as the chips' documents do.
 TEST(Riva, SimstateNamesTheRawRegisters)
 {

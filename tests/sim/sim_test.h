@@ -52,4 +52,18 @@ inline std::string RegText(HKEY root, const std::string& path, const char* name)
     return ReadRegistryRaw(root, path, name).c_str();
 }
 
+// simstate's report of the current machine.
+inline std::string PrintedState()
+{
+    std::string text;
+    FILE* f = tmpfile();
+    if (!f) return text;
+    SimPrintState(f);
+    rewind(f);
+    char buffer[4096];
+    for (size_t n; (n = fread(buffer, 1, sizeof buffer, f)) > 0;) text.append(buffer, n);
+    fclose(f);
+    return text;
+}
+
 #endif
