@@ -103,6 +103,7 @@ const SimFamilyOps* SimCardOps(int card)
     case SIM_FAMILY_S3: return &sim_s3_ops;
     case SIM_FAMILY_NVIDIA: return &sim_riva_ops;
     case SIM_FAMILY_TRIDENT: return &sim_trident_ops;
+    case SIM_FAMILY_ET6000: return &sim_et6000_ops;
     default: return &sim_vga_ops;
     }
 }
