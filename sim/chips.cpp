@@ -105,6 +105,8 @@ const SimFamilyOps* SimCardOps(int card)
     case SIM_FAMILY_BANSHEE: return &sim_banshee_ops;
     case SIM_FAMILY_I740: return &sim_i740_ops;
     case SIM_FAMILY_PERMEDIA: return &sim_permedia_ops;
+    case SIM_FAMILY_TRIDENT: return &sim_trident_ops;
+    case SIM_FAMILY_ET6000: return &sim_et6000_ops;
     default: return &sim_vga_ops;
     }
 }

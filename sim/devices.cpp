@@ -182,16 +182,14 @@ BOOL MachineCloseDevice(HANDLE device)
 }
 
 // Interrupt 10h of the primary card's BIOS. Only the Tseng BIOS answers
-// function 12h, BL = F2h: BX = (megabytes << 4) | (remaining KB / 64).
+// function 12h, BL = F2h, with the memory it found.
 int MachineVideoBios(BiosRegisters* regs)
 {
     int card = SimPrimaryCard();
     if (card < 0 || sim->config.windows == SIM_WINDOWS_NT4 || !regs) return 0;
     if (regs->ax != 0x1203 || (regs->bx & 0xFF) != 0xF2) return 0;
     if (SimCardChip(card)->family != SIM_FAMILY_ET6000) return 0;
-    const SimCardConfig* c = &sim->config.cards[card];
-    uint32_t kb = c->memory_mb * 1024 + c->memory_extra_kb;
-    regs->bx = (uint16_t)(((kb / 1024) << 4) | ((kb % 1024) / 64 & 0x0F));
+    regs->bx = Et6000BiosMemory(card);
     regs->ax = 0x1212;
     return 1;
 }

@@ -51,6 +51,20 @@ int DecodeAddress(uint32_t address, int* bar, uint32_t* offset)
     return -1;
 }
 
+// The card whose I/O base address register holds a port, or -1. Its
+// family's port hooks decode what lies there.
+int DecodeIoPort(uint16_t port)
+{
+    for (int card = 0; card < sim->config.card_count; card++) {
+        const SimChip* chip = SimCardChip(card);
+        for (int i = 0; i < 6; i++) {
+            uint32_t base = PciIoBarBase(card, i);
+            if (base && port >= base && port - base < chip->bars[i].size) return card;
+        }
+    }
+    return -1;
+}
+
 }  // namespace
 
 int SimCardValid(int card) { return sim && card >= 0 && card < sim->config.card_count; }
@@ -92,6 +106,10 @@ uint8_t SimPortRead(uint16_t port)
     if (port >= 0xCF8 && port <= 0xCFF) return PciPortRead(port);
     int primary = SimPrimaryCard();
     if (IsVgaPort(port) && primary >= 0) return VgaRead(primary, port);
+    int card = DecodeIoPort(port);
+    const SimFamilyOps* ops = card >= 0 ? SimCardOps(card) : NULL;
+    uint8_t value;
+    if (ops && ops->read_port && ops->read_port(card, port, &value)) return value;
     return 0xFF;
 }
 
@@ -103,7 +121,13 @@ void SimPortWrite(uint16_t port, uint8_t value)
         return;
     }
     int primary = SimPrimaryCard();
-    if (IsVgaPort(port) && primary >= 0) VgaWrite(primary, port, value);
+    if (IsVgaPort(port) && primary >= 0) {
+        VgaWrite(primary, port, value);
+        return;
+    }
+    int card = DecodeIoPort(port);
+    const SimFamilyOps* ops = card >= 0 ? SimCardOps(card) : NULL;
+    if (ops && ops->write_port) ops->write_port(card, port, value);
 }
 
 uint8_t SimWindowRead(uint32_t address)

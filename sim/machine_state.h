@@ -123,8 +123,9 @@ struct SimFamilyOps {
     SimDpms (*dpms)(int card);
     // The display driver's mode set: CRT timing, depth and pixel clock.
     void (*program_mode)(int card, const struct SimTiming* timing, int bits);
-    // I/O ports of the legacy range that the VGA core does not own (NULL: none);
-    // 1 when the family decodes the port.
+    // I/O ports of the legacy range that the VGA core does not own, and the
+    // ports of the card's I/O base address registers (NULL: none); 1 when the
+    // family decodes the port.
     int (*read_port)(int card, uint16_t port, uint8_t* value);
     int (*write_port)(int card, uint16_t port, uint8_t value);
     // simstate's raw clock-synthesizer lines, named as the chip's documents
@@ -152,6 +153,12 @@ enum { SIM_PERMEDIA_RECORD_SIZE = 14 };
 // porch, sync and back porch in characters of 8 pixels, vertical ones in
 // lines, each sync's polarity (1 = positive).
 void PermediaTimingRecord(const SimTiming* timing, uint8_t* record);
+extern const SimFamilyOps sim_trident_ops;
+extern const SimFamilyOps sim_et6000_ops;
+
+// --- et6000.cpp ---
+// The ET6000 BIOS's memory answer (interrupt 10h, AX = 1203h, BL = F2h): BX.
+uint16_t Et6000BiosMemory(int card);
 
 // --- vga.cpp ---
 void VgaReset(int card);
@@ -175,6 +182,7 @@ uint8_t PciConfigRead(int bus, int device, int function, int offset);
 void PciConfigWrite(int bus, int device, int function, int offset, uint8_t value);
 int PciFindCard(int bus, int device);  // card index, or -1
 uint32_t PciBarBase(int card, int bar);  // 0 when the BAR or memory decode is off
+uint32_t PciIoBarBase(int card, int bar);  // an I/O BAR's port base; 0 when not one or I/O decode is off
 uint8_t PciPortRead(uint16_t port);
 void PciPortWrite(uint16_t port, uint8_t value);
 uint32_t PciPortReadDword(uint16_t port);

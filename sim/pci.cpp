@@ -222,6 +222,14 @@ uint32_t PciBarBase(int card, int bar)
     return Get32(h, 0x10 + 4 * bar) & 0xFFFFFFF0u;
 }
 
+uint32_t PciIoBarBase(int card, int bar)
+{
+    const uint8_t* h = sim->cards[card].pci;
+    const SimBar* b = &SimCardChip(card)->bars[bar];
+    if (!b->size || !(b->flags & SIM_BAR_IO) || !(Get16(h, 0x04) & COMMAND_IO)) return 0;
+    return Get32(h, 0x10 + 4 * bar) & 0xFFFCu;
+}
+
 namespace {
 uint8_t DataRead(int byte)
 {

@@ -5,13 +5,18 @@
 #include "base/adapters.h"
 #include "base/module_reset.h"
 #include "base/state.h"
+#include "chips/banshee.h"
 #include "chips/et6000.h"
+#include "chips/i740.h"
 #include "chips/permedia2.h"
 #include "chips/riva.h"
 #include "chips/s3.h"
 #include "chips/trident.h"
 #include "chips/unsupported.h"
 
+#define BANSHEE_FAMILY \
+    .Dispatch = BansheeDispatch, .SetPixelClock = BansheeSetPixelClock, .GetPixelClock = BansheeGetPixelClock
+#define I740_FAMILY .Dispatch = I740Dispatch, .SetPixelClock = I740SetPixelClock, .GetPixelClock = I740GetPixelClock
 #define RIVA_FAMILY .Dispatch = RivaDispatch, .SetPixelClock = RivaSetPixelClock, .GetPixelClock = RivaGetPixelClock
 #define S3_FAMILY .Dispatch = S3Dispatch, .SetPixelClock = S3SetPixelClock, .GetPixelClock = S3GetPixelClock
 #define ET6000_FAMILY \
@@ -28,8 +33,8 @@ const ChipRow chip_table[CHIP_TABLE_ROWS] = {
     {.vendor_id = 0x12d2, .device_id = 0x0018, RIVA_FAMILY},         // Riva 128
     {.vendor_id = 0x12d2, .device_id = 0x0019, RIVA_FAMILY},         // Riva 128ZX
     {.vendor_id = 0x10de, .device_id = 0x0020, RIVA_FAMILY},         // Riva TNT
-    {.vendor_id = 0x8086, .device_id = 0x7800, UNSUPPORTED_FAMILY},  // i740
-    {.vendor_id = 0x121a, .device_id = 0x0003, UNSUPPORTED_FAMILY},  // Voodoo Banshee
+    {.vendor_id = 0x8086, .device_id = 0x7800, I740_FAMILY},         // i740
+    {.vendor_id = 0x121a, .device_id = 0x0003, BANSHEE_FAMILY},      // Voodoo Banshee
     {.vendor_id = 0x1023, .device_id = 0x939a, TRIDENT_FAMILY},      // Trident 939a
     {.vendor_id = 0x5333, .device_id = 0x8a13, S3_FAMILY},           // Trio3D/2X
     {.vendor_id = 0x5333, .device_id = 0x8a20, S3_FAMILY},           // Savage3D

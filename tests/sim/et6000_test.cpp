@@ -1,0 +1,103 @@
+// The ET6000 model: the CLKDAC in the PCI I/O range found through CR21,
+// the clock number, DPMS, memory configuration and the BIOS's memory
+// answer, and the display driver's mode set read back from the registers.
+#include "modes.h"
+#include "sim_test.h"
+
+static void BootEt6000(int windows = SIM_WINDOWS_98, int memory_mb = 4, int extra_kb = 0)
+{
+    SimCardConfig card = Card(0x100c, 0x3208);
+    card.memory_mb = memory_mb;
+    card.memory_extra_kb = extra_kb;
+    SimMachineConfig config = Machine(windows, {card});
+    config.start_bits = 8;
+    SimBoot(&config);
+}
+static uint16_t IoPort(uint8_t offset) { return (uint16_t)(ReadCr(0x21) << 8 | offset); }
+
+TEST(Et6000, ClkdacThroughThePortsCr21Names)
+{
+    BootEt6000();
+    EXPECT_EQ(SimCardBarAddress(0, 1) >> 8, ReadCr(0x21));
+    // Clock 5: M 100, N 5, R 1 (clock select 1 in MISC, CS2 in CR34).
+    MachineOutByte(IoPort(0x67), 5);
+    MachineOutByte(IoPort(0x69), 100);
+    MachineOutByte(IoPort(0x69), 5 | 1 << 5);
+    MachineOutByte(0x3C2, (MachineInByte(0x3CC) & ~0x0C) | 0x04);
+    WriteCr(0x34, 0x02);
+    EXPECT_NEAR(14318180.0 * 102 / (7 * 2), SimPixelClockHz(0), 1);
+    // The memory clock at 0x0A, M then N; a new index starts again at M.
+    MachineOutByte(IoPort(0x67), 0x0A);
+    EXPECT_EQ(75, MachineInByte(IoPort(0x69)));
+    MachineOutByte(IoPort(0x67), 0x0A);
+    EXPECT_EQ(75, MachineInByte(IoPort(0x69)));
+    EXPECT_EQ(0x24, MachineInByte(IoPort(0x69)));
+    EXPECT_NEAR(14318180.0 * 77 / (6 * 2), SimMemoryClockHz(0), 1);
+    uint16_t index_port = IoPort(0x67);
+    PciWrite(0, 10, 0x04, 0x02);  // I/O decode off
+    EXPECT_EQ(0xFF, MachineInByte(index_port));
+}
+
+TEST(Et6000, DpmsFromCr34)
+{
+    BootEt6000();
+    const struct { uint8_t cr34; SimDpms state; } cases[] = {
+        {0x02, SIM_DPMS_ON}, {0x01, SIM_DPMS_STANDBY}, {0x20, SIM_DPMS_SUSPEND}, {0x21, SIM_DPMS_OFF}};
+    for (const auto& c : cases) {
+        WriteCr(0x34, c.cr34);
+        EXPECT_EQ(c.state, SimDpmsState(0)) << std::hex << (int)c.cr34;
+    }
+}
+
+// The BIOS finds memory in 64 KB blocks; the MDRAM configuration counts
+// banks of 256 or 512 KB and reads 2.25 MB as 2.5 (X.org tseng).
+TEST(Et6000, MemoryAnswers)
+{
+    const struct { int windows, mb, extra_kb; uint16_t bx; uint8_t banks, doubled; } cases[] = {
+        {SIM_WINDOWS_95, 2, 256, 0x0024, 4, 0x04},
+        {SIM_WINDOWS_95, 1, 0, 0x0010, 3, 0x00},
+        {SIM_WINDOWS_NT4, 4, 0, 0, 7, 0x04},
+    };
+    for (const auto& c : cases) {
+        BootEt6000(c.windows, c.mb, c.extra_kb);
+        BiosRegisters regs = {.ax = 0x1203, .bx = 0x00F2, .cx = 0, .dx = 0};
+        EXPECT_EQ(c.bx != 0, MachineVideoBios(&regs) != 0);
+        if (c.bx) EXPECT_EQ(c.bx, regs.bx);
+        EXPECT_EQ(c.banks, MachineInByte(IoPort(0x47)) & 0x07);
+        EXPECT_EQ(c.doubled, MachineInByte(IoPort(0x45)) & 0x04);
+        EXPECT_EQ(3, MachineInByte(0x3C2) & 0x03) << "MDRAM";
+    }
+}
+
+TEST(Et6000, DmtModesRunAtTheirRates)
+{
+    const struct { int w, h, bits, hz; } cases[] = {
+        {640, 480, 8, 60}, {1280, 1024, 8, 75}, {1024, 768, 16, 85}, {800, 600, 32, 72}};
+    for (const auto& c : cases) {
+        BootEt6000(SIM_WINDOWS_NT4);
+        ASSERT_TRUE(SimSetCardMode(0, c.w, c.h, c.bits, c.hz)) << c.w << "x" << c.h << "x" << c.bits;
+        const SimTiming* t = SimFindTiming(c.w, c.h, c.hz, false);
+        EXPECT_EQ(t->htotal / 8, SimHTotal(0));
+        EXPECT_EQ(t->vtotal, SimVTotal(0));
+        EXPECT_NEAR(SimTimingFrameRate(t), SimRefreshHz(0), 1.0) << c.w << "x" << c.h << "x" << c.bits;
+        EXPECT_EQ(2, (MachineInByte(0x3CC) >> 2 & 3) | (ReadCr(0x34) & 0x02) << 1) << "clock 2";
+        SimWriteRegister(0, SIM_REG_CRTC, 0x3F, SimReadRegister(0, SIM_REG_CRTC, 0x3F) ^ 0x01);
+        SimWriteRegister(0, SIM_REG_CRTC, 0x35, SimReadRegister(0, SIM_REG_CRTC, 0x35) ^ 0x02);
+        EXPECT_EQ(((t->htotal / 8 - 5) ^ 256) + 5, SimHTotal(0)) << "CR3F bit 0 is bit 8 of the total";
+        EXPECT_EQ(((t->vtotal - 2) ^ 1024) + 2, SimVTotal(0)) << "CR35 bit 1 is bit 10";
+    }
+}
+
+// simstate names the synthesizer registers as the chips' documents do.
+TEST(Et6000, SimstateNamesTheRawRegisters)
+{
+    BootEt6000();
+    std::string text = PrintedState();
+    EXPECT_NE(std::string::npos, text.find("\nET6000_CLKDAC_MCLK=4B24\n"));
+    EXPECT_NE(std::string::npos, text.find("\nET6000_CLKDAC_PLL2="));
+    SimCardConfig card = Card(0x1023, 0x939a);
+    SimMachineConfig config = Machine(SIM_WINDOWS_98, {card});
+    SimBoot(&config);
+    SimWriteRegister(0, SIM_REG_SEQUENCER, 0x19, 0x45);
+    EXPECT_NE(std::string::npos, PrintedState().find("\nTRIDENT_SR19_CLOCK_HIGH=45\nTRIDENT_SR1A_CLOCK_LOW_B="));
+}
