@@ -6,7 +6,7 @@
 //   snap.exe <out folder> <machine folder> <wine version> <scenario>
 //   scenarios: single (one card, every window), nt (menu, Desktop, Monitor),
 //              dual (two cards: menu, the second card's Desktop page), panning,
-//              tnt (a Riva TNT: menu, Information, Performance)
+//              family:<prefix>:<card> (one card's menu and every page)
 #include <windows.h>
 #include <commctrl.h>
 #include <prsht.h>
@@ -219,6 +219,11 @@ void Key(HWND w, UINT key)
 
 HWND OpenMenu(HWND main)
 {
+    // After a machine of another screen size the taskbar follows the desktop a moment late.
+    HWND taskbar = FindWindowA("Shell_TrayWnd", NULL);
+    for (DWORD start = GetTickCount(); taskbar && GetTickCount() - start < 5000; Sleep(50))
+        if (Box(taskbar).bottom <= GetSystemMetrics(SM_CYSCREEN) && Box(taskbar).right <= GetSystemMetrics(SM_CXSCREEN))
+            break;
     PostMessageA(main, tray_callback, 0, WM_LBUTTONDOWN);
     return Shown("#32768");
 }
@@ -378,28 +383,46 @@ void Single(HWND main)
     ExitQuestion(main, true);
 }
 
-// A Riva TNT on the AGP bus: its menu, and the pages only it fills.
-void Tnt(HWND main)
+// One card of a family: its menu and every page its chip allows, each
+// photographed as <prefix>-<page>; the Information page must name the
+// card's memory and the Performance page stand at the clock it shows.
+void Family(HWND main, const std::string& prefix, const std::string& card)
 {
     HWND menu = OpenMenu(main);
-    if (!Check(menu != NULL, "the tray icon opens no menu")) return;
+    if (!Check(menu != NULL, prefix + ": the tray icon opens no menu")) return;
     Settle(menu);
-    Photograph("tnt-menu", WithTaskbar(Box(menu)), "The tray menu of a Riva TNT: a Performance entry for its memory clock");
+    Photograph((prefix + "-menu").c_str(), WithTaskbar(Box(menu)), ("The tray menu of " + card).c_str());
     Key(menu, VK_ESCAPE);
     WaitGone(menu);
     PostMessageA(main, WM_COMMAND, first_page_command, 0);
     HWND sheet = Shown("#32770");
-    if (!Check(sheet != NULL, "TNT: no sheet")) return;
-    HWND page = ShowPage(sheet, 1);
-    std::vector<std::string> info = ListLines(Control(page, INFO_LIST));
-    if (Check(Contains(info, "AGP 2x") && Contains(info, "16.0 MB") && Contains(info, "MHz"),
-              "TNT Information: no AGP 2x, 16.0 MB or memory clock line"))
-        Photograph("tnt-information", Around(Box(sheet), 8), "Information page of a Riva TNT: AGP 2x, 16 MB, its memory clock");
-    page = ShowPage(sheet, 3);
-    std::string clock = Text(Control(page, PERF_VALUE));
-    if (Check(Maximum(page, PERF_SLIDER) == 133 && Position(page, PERF_SLIDER) == atoi(clock.c_str()),
-              "TNT Performance: the slider does not stand at " + clock + " of 90..133"))
-        Photograph("tnt-performance", Around(Box(sheet), 8), "Performance page: the TNT's memory clock, 90 to 133 MHz");
+    if (!Check(sheet != NULL, prefix + ": no sheet")) return;
+    HWND tabs = (HWND)Send(sheet, PSM_GETTABCONTROL);
+    for (int i = 0; i < (int)Send(tabs, TCM_GETITEMCOUNT); ++i) {
+        HWND page = ShowPage(sheet, i);
+        // The tab's text does not cross processes: the page tells itself by its controls.
+        // (ids repeat across the pages' templates: each test names one only its page has)
+        std::string name = Control(page, RES_SLIDER)     ? "desktop"
+                           : Control(page, PERF_SLIDER)  ? "performance"
+                           : Control(page, INFO_AUTORUN) ? "information"
+                                                         : "monitor",
+                    shown;
+        std::string title = name;
+        title[0] = (char)toupper(title[0]);
+        if (name == "information") {
+            std::vector<std::string> info = ListLines(Control(page, INFO_LIST));
+            for (const std::string& l : info) printf("tour:   %s Information: %s\n", prefix.c_str(), l.c_str());
+            if (!Check(Contains(info, " MB"), prefix + " Information: no memory line")) continue;
+        }
+        if (name == "performance") {
+            std::string clock = Text(Control(page, PERF_VALUE));
+            shown = ", " + clock + " MHz";
+            if (!Check(Maximum(page, PERF_SLIDER) > 0 && Position(page, PERF_SLIDER) == atoi(clock.c_str()),
+                       prefix + " Performance: the slider does not stand at " + clock))
+                continue;
+        }
+        Photograph((prefix + "-" + name).c_str(), Around(Box(sheet), 8), (title + " page of " + card + shown).c_str());
+    }
     CloseSheet(sheet);
     ExitQuestion(main, false);
 }
@@ -487,7 +510,12 @@ int main(int argc, char** argv)
         else if (scenario == "single") Single(main);
         else if (scenario == "nt") Nt(main);
         else if (scenario == "dual") Dual(main);
-        else if (scenario == "tnt") Tnt(main);
+        else if (scenario.rfind("family:", 0) == 0) {
+            // family:<prefix>:<the card, for the captions>
+            std::string rest = scenario.substr(7);
+            size_t colon = rest.find(':');
+            Family(main, rest.substr(0, colon), colon == std::string::npos ? rest : rest.substr(colon + 1));
+        }
         else Fail("unknown scenario " + scenario);
     }
     if (Running()) TerminateProcess(panel.hProcess, 1);
