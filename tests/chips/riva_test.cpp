@@ -5,6 +5,7 @@
 #include "base/settings.h"
 #include "base/state.h"
 #include "chips/chips.h"
+#include "hardware/driver_key.h"
 #include "hardware/machine.h"
 #include "modes/detect.h"
 #include "modes/mode_list.h"
@@ -79,6 +80,24 @@ TEST(Riva, ClocksAndMemoryFromEveryPath)
         EXPECT_EQ((uint32_t)SimVTotal(0), chip_get_vtotal());
         chip_close_io();
         EXPECT_EQ(0xFFF80000u, SimReadInternal32(0, VPLL) & 0xFFF80000) << "the bits above P stay";
+    }
+}
+
+// NT reads the size from the display driver's binary value, by its third and fourth bytes.
+TEST(Riva, MemorySizeOnNtFromTheDriversValue)
+{
+    ASSERT_NO_FATAL_FAILURE(BootRiva(TNT, SIM_WINDOWS_NT4));
+    char key[DRIVER_KEY_SIZE];
+    ASSERT_EQ(1, FindDriverKey(key));
+    const struct { uint32_t bytes, size; } cases[] = {
+        {8u << 20, 8u << 16}, {4u << 20, 4u << 16}, {12u << 20, 12u << 16}, {16u << 20, 16u << 16},
+        {32u << 20, 32u << 16}, {2u << 20, 0}, {64u << 20, 0}};
+    for (const auto& c : cases) {
+        HKEY k;
+        ASSERT_EQ(ERROR_SUCCESS, RegOpenKeyExA(HKEY_LOCAL_MACHINE, key, 0, KEY_SET_VALUE, &k));
+        RegSetValueExA(k, "HardwareInformation.MemorySize", 0, REG_BINARY, (const BYTE*)&c.bytes, sizeof c.bytes);
+        RegCloseKey(k);
+        EXPECT_EQ(c.size, chip_get_mem_size()) << std::hex << c.bytes;
     }
 }
 

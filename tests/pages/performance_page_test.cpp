@@ -48,6 +48,9 @@ TEST(PerformancePage, ApplyCancelAndDefaultOnTheCard)
     ASSERT_EQ(1, DetectAdapters());
     RefreshAdapterModes(REFRESH_AT_STARTUP);
     SaveSetting(SETTING_RESET, 0);
+    std::string texts = MakeScratchFolder("performance") + "ZNTR2.INI";
+    WriteTextFile(texts, "[TASKBAR]\r\nMCLKWARN=Careful (test)\r\n");
+    lstrcpynA(text_ini_path, texts.c_str(), sizeof text_ini_path);
     const int before = CardMhz();
     ASSERT_TRUE(before >= 90 && before <= 123) << before;
     EXPECT_TRUE(RunSheet(PAGE_PERFORMANCE, [&](HWND sheet) {
@@ -56,6 +59,9 @@ TEST(PerformancePage, ApplyCancelAndDefaultOnTheCard)
         EXPECT_EQ(before, SliderAt(page));
         EXPECT_EQ(90, SendDlgItemMessageA(page, IDC_PERF_SLIDER, TBM_GETRANGEMIN, 0, 0));
         EXPECT_EQ(133, SendDlgItemMessageA(page, IDC_PERF_SLIDER, TBM_GETRANGEMAX, 0, 0));
+        char warning[100] = "";
+        GetDlgItemTextA(page, IDC_PERF_WARNING, warning, sizeof warning);
+        EXPECT_STREQ("Careful (test)", warning) << "the text file's warning";
 
         Slide(page, before + 10);
         EXPECT_EQ(before, CardMhz()) << "the slider alone leaves the chip";
