@@ -55,9 +55,15 @@ void BootPermedia2(int windows = SIM_WINDOWS_98)
 TEST(TimingList, RecordsGoFirstInTheDriversList)
 {
     ASSERT_NO_FATAL_FAILURE(BootPermedia2());
-    const std::vector<std::string> before = List(800, 600);
+    std::vector<std::string> before = List(800, 600);
     ASSERT_GE(before.size(), 2u);
     ASSERT_EQ(60, before[0][0]);
+    // Byte 1 may name a higher rate, as the records' does: byte 0 decides.
+    before[0][1] = (char)200;
+    HKEY key;
+    ASSERT_EQ(1, OpenDriverSubkeyForUpdate("\\DEFAULT\\TIMINGS\\800,600", &key));
+    RegSetValueExA(key, "1", 0, REG_BINARY, (const BYTE*)before[0].data(), (DWORD)before[0].size());
+    RegCloseKey(key);
     ChipTiming timing;
     ASSERT_EQ(3u, chip_prepare_mode(800, 600, 16, 160, &timing));
     const BYTE record_800_160[CHIP_TIMING_SIZE] = {0xa0, 0xc8, 0x86, 0, 6, 0x0b, 0x11, 1, 0x7c, 2, 1, 3, 0x20, 1};
