@@ -25,6 +25,7 @@ set(VISTREL_WIN4_LINK_FLAGS -s -nostdlib
     -Wl,--major-subsystem-version,4 -Wl,--minor-subsystem-version,0
     -Wl,--gc-sections)
 set(VISTREL_COMPANION_LINK_FLAGS ${VISTREL_WIN4_LINK_FLAGS})
+set(VISTREL_GATE_MACHINE ${VISTREL_ROOT}/src/hardware/machine_x86.cpp)
 include(${VISTREL_ROOT}/cmake/companions.cmake)
 
 add_executable(vistrel WIN32 ${VISTREL_PROGRAM_SOURCES}

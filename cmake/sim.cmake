@@ -38,6 +38,12 @@ endfunction()
 # it from beside the running program into Windows' folders at boot.
 vistrel_version_dll(simdriver ${VISTREL_ROOT}/sim/display_driver.rc ${SIM_DIR})
 
+# The simulated gatectl.exe switches the machine of its folder on, as
+# vistrel-sim.exe does, and asks that machine's display driver.
+target_sources(gatectl PRIVATE ${VISTREL_ROOT}/sim/boot_description.cpp)
+target_include_directories(gatectl PRIVATE ${VISTREL_ROOT}/sim)
+target_link_libraries(gatectl PRIVATE vistrel_sim)
+
 add_executable(vistrel-sim WIN32 ${VISTREL_ROOT}/src/shell/winmain.cpp ${VISTREL_ROOT}/sim/boot_description.cpp
                ${VISTREL_ROOT}/resources/vistrel.rc)
 target_include_directories(vistrel-sim PRIVATE ${VISTREL_ROOT}/src ${VISTREL_ROOT}/sim ${VISTREL_ROOT}/resources)

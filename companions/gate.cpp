@@ -1,7 +1,5 @@
 #include "gate.h"
 
-#include <ddraw.h>
-
 #include "base/protocol.h"
 #include "base/runtime.h"
 #include "hardware/shutdown.h"
@@ -71,29 +69,6 @@ uint32_t PackMemorySize(uint32_t bytes)
     uint32_t megabytes = bytes >> 20;
     uint32_t kilobytes = (bytes >> 10) & 1023;
     return (megabytes << 16) | (kilobytes / 64 * 64);
-}
-
-typedef HRESULT(WINAPI* DirectDrawCreateProc)(GUID*, IDirectDraw**, IUnknown*);
-
-uint32_t MeasureVideoMemory()
-{
-    // Windows 95 may have no DirectX at all, so ddraw.dll is not imported.
-    HMODULE ddraw = LoadLibraryA("ddraw.dll");
-    if (!ddraw) return 0;
-    uint32_t total = 0;
-    DirectDrawCreateProc create = (DirectDrawCreateProc)GetProcAddress(ddraw, "DirectDrawCreate");
-    IDirectDraw* draw = NULL;
-    if (create && SUCCEEDED(create(NULL, &draw, NULL)) && draw) {
-        // The DirectX 3 form of the capabilities is the oldest that every
-        // runtime since takes.
-        DDCAPS_DX3 caps;
-        memset(&caps, 0, sizeof caps);
-        caps.dwSize = sizeof caps;
-        if (SUCCEEDED(draw->GetCaps((DDCAPS*)&caps, NULL))) total = caps.dwVidMemTotal;
-        draw->Release();
-    }
-    FreeLibrary(ddraw);
-    return total;
 }
 
 int ReplyMemorySize(const char* window_class, uint32_t size)

@@ -27,9 +27,6 @@ int ParseGateCommand(const char* arguments, GateRequest* request);
 // them in steps of 64.
 uint32_t PackMemorySize(uint32_t bytes);
 
-// Bytes of video memory DirectDraw knows of; 0 without DirectDraw.
-uint32_t MeasureVideoMemory();
-
 // Posts the answer (message 1228, lParam = size) to the window of that
 // class. 1 when there was such a window.
 int ReplyMemorySize(const char* window_class, uint32_t size);

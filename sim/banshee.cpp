@@ -5,6 +5,7 @@
 // mode set. Written from Linux tdfxfb, the X.org tdfx driver, 86Box's
 // Banshee model and Haiku's 3dfx accelerant; sim/README.md lists where the
 // program's register description differs and which one the model follows.
+#include <math.h>
 #include <string.h>
 
 #include "fields.h"
@@ -15,10 +16,10 @@ namespace {
 
 const double fref_hz = 14318180.0;
 const double vga_clock_hz[2] = {25175000.0, 28322000.0};
-// Above this pixel clock the display driver runs the DAC in 2X mode, two
-// pixels a clock edge, with the horizontal CRT values halved (tdfxfb:
-// half of the Banshee's 270 MHz).
-const uint32_t one_x_max_hz = 135000000;
+// From this width on the display driver runs the DAC in 2X mode, two pixels
+// a clock edge, with the horizontal CRT values halved (sim/README.md: tdfxfb
+// switches by the pixel clock instead).
+const int twice_min_width = 1600;
 
 enum Offset : uint32_t {
     MISC_INIT0 = 0x10,
@@ -130,10 +131,10 @@ double MemoryClock(int card) { return SynthesizerHz(card, PLL_CTRL2); }
 bool TwiceMode(int card) { return SimFieldRead(Bytes(card, VID_PROC_CFG), &f.proc_2x) != 0; }
 
 // A line is the horizontal total plus 5 character clocks of 8 pixels; in
-// 2X mode every horizontal value counts double.
+// 2X mode every unit of the total counts two (sim/README.md).
 int LineCharacters(int card)
 {
-    return (SimFieldRead(Core(card)->cr, &crtc.htotal) + 5) * (TwiceMode(card) ? 2 : 1);
+    return SimFieldRead(Core(card)->cr, &crtc.htotal) * (TwiceMode(card) ? 2 : 1) + 5;
 }
 int FrameLines(int card) { return SimFieldRead(Core(card)->cr, &crtc.vtotal) + 2; }
 double Refresh(int card) { return PixelClock(card) / (8.0 * LineCharacters(card) * FrameLines(card)); }
@@ -181,22 +182,29 @@ int WriteInternal32(int card, uint32_t offset, uint32_t value)
 
 // --- reset and the display driver's mode set ---
 
-SimPllLimits PllLimits()
-{
-    // tdfxfb's search: any multiplier and divider, K 0..3, no VCO bound.
-    return {.fref_hz = fref_hz, .a = 2, .b = 2, .m_min = 0, .m_max = 255, .n_min = 0, .n_max = 63, .r_min = 0,
-            .r_max = 3, .vco_min_hz = 0, .vco_max_hz = 1e12};
-}
-
+// tdfxfb's search, in its order: K from 3 down, the divider from 63 down,
+// the two multipliers next to the exact one; of equally close settings the
+// first stays, so the finest steps win.
 void SetPll(int card, Offset offset, double hz)
 {
-    SimPllLimits limits = PllLimits();
-    SimPllSetting pll;
-    if (!SimPllBest(&limits, hz, &pll)) return;
+    int best_multiplier = 0, best_divider = 0, best_k = 0;
+    double best_error = hz;
+    for (int k = 3; k >= 0; k--) {
+        for (int divider = 63; divider >= 0; divider--) {
+            int estimate = (int)(hz * (divider + 2) * (1 << k) / fref_hz) - 2;
+            for (int multiplier = estimate < 0 ? 0 : estimate; multiplier <= estimate + 1 && multiplier <= 255;
+                 multiplier++) {
+                double error = fabs(fref_hz * (multiplier + 2) / ((divider + 2) * (double)(1 << k)) - hz);
+                if (error >= best_error) continue;
+                best_error = error;
+                best_multiplier = multiplier, best_divider = divider, best_k = k;
+            }
+        }
+    }
     uint8_t* b = Bytes(card, offset);
-    SimFieldWrite(b, &f.pll_n, pll.m);
-    SimFieldWrite(b, &f.pll_m, pll.n);
-    SimFieldWrite(b, &f.pll_k, pll.r);
+    SimFieldWrite(b, &f.pll_n, best_multiplier);
+    SimFieldWrite(b, &f.pll_m, best_divider);
+    SimFieldWrite(b, &f.pll_k, best_k);
 }
 
 int MemoryCode(int card)
@@ -217,10 +225,12 @@ void Reset(int card)
     SetPll(card, PLL_CTRL0, vga_clock_hz[0]);
 }
 
+// The total in characters of 8 pixels less 5, in units of the register
+// (two characters in 2X mode), rounded half up.
 SimCrtcTiming CrtcValues(const SimTiming* t, int pixels)
 {
     SimCrtcTiming c;
-    c.htotal = (t->htotal + pixels / 2) / pixels - 5;
+    c.htotal = ((t->htotal + 4) / 8 - 5 + pixels / 16) * 8 / pixels;
     c.hdisplay_end = t->width / pixels - 1;
     c.hblank_start = t->width / pixels;
     c.hblank_end = t->htotal / pixels - 1;
@@ -238,7 +248,7 @@ SimCrtcTiming CrtcValues(const SimTiming* t, int pixels)
 void ProgramMode(int card, const SimTiming* t, int bits)
 {
     SimVga* v = Core(card);
-    bool twice = t->pixel_hz > one_x_max_hz;
+    bool twice = t->width >= twice_min_width;
     SimCrtcTiming c = CrtcValues(t, twice ? 16 : 8);
     v->cr[0x1A] = 0;
     v->cr[0x1B] = 0;

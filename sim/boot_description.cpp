@@ -1,5 +1,6 @@
-// Linked into vistrel-sim.exe only: the machine is switched on before the
-// program starts, from SIMMACHINE.INI beside the executable.
+// Linked into vistrel-sim.exe and the simulated gatectl.exe: the machine is
+// switched on before the program starts, from SIMMACHINE.INI beside the
+// executable.
 #include <string.h>
 #include <windows.h>
 

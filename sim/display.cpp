@@ -452,6 +452,15 @@ int MachineScreenRefresh()
     return (int)(hz + 0.5);
 }
 
+// DirectDraw's total: the primary card's whole memory. Without a machine
+// no display driver of ours answers.
+uint32_t MachineVideoMemory()
+{
+    int card = sim ? PrimaryCard() : -1;
+    if (card < 0) return 0;
+    return (uint32_t)DisplayCardLimits(card).memory_bytes;
+}
+
 int MachineDeviceModeField(const char* device, int cap_index)
 {
     if (!sim) {

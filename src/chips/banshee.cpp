@@ -42,7 +42,7 @@ static const uint8_t memory_size_mb[4] = {8, 16, 32, 0};
 
 struct BansheeDpmsState {
     uint32_t command;
-    uint32_t syncs;  // ORed into the sync control; On clears it
+    uint32_t syncs;  // the sync control's bits 4..1 for the state
 };
 static const BansheeDpmsState banshee_dpms_states[] = {
     {.command = CMD_DPMS_ON, .syncs = 0x0},
@@ -175,11 +175,10 @@ static uint32_t SetDpms(uint32_t command)
 {
     if (!Window()) return 0;
     uint32_t value = MachineReadDword(Window() + DAC_MODE);
-    for (const BansheeDpmsState& s : banshee_dpms_states) {
-        if (s.command != command) continue;
-        if (command == CMD_DPMS_ON) value &= ~Pack(dpms_syncs.mask, &dpms_syncs);
-        value |= Pack(s.syncs, &dpms_syncs);
-    }
+    // Every state replaces the one before: ORed onto Standby's bits a
+    // Suspend would stop both syncs, which is Off.
+    for (const BansheeDpmsState& s : banshee_dpms_states)
+        if (s.command == command) value = (value & ~Pack(dpms_syncs.mask, &dpms_syncs)) | Pack(s.syncs, &dpms_syncs);
     MachineWriteDword(Window() + DAC_MODE, value);
     return 1;
 }

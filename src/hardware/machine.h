@@ -45,6 +45,9 @@ BOOL MachineEnumDisplaySettings(const char* device, DWORD mode_number, DEVMODEA*
 LONG MachineChangeDisplaySettings(DEVMODEA* mode, DWORD flags);
 // GetDeviceCaps(VREFRESH) of the screen.
 int MachineScreenRefresh();
+// The display memory the primary display driver reports to DirectDraw
+// (dwVidMemTotal), in bytes; 0 without DirectDraw.
+uint32_t MachineVideoMemory();
 // GetDeviceCaps(HORZRES, VERTRES or BITSPIXEL) of a DC made with CreateDCA of
 // the device name; 0 when no DC can be made.
 int MachineDeviceModeField(const char* device, int cap_index);

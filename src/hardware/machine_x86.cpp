@@ -2,6 +2,10 @@
 // the driver devices and the display driver through USER32 and GDI32.
 #include "hardware/machine.h"
 
+#include <ddraw.h>
+
+#include "base/runtime.h"
+
 uint8_t MachineInByte(uint16_t port)
 {
     uint8_t value;
@@ -64,6 +68,29 @@ int MachineScreenRefresh()
     int hz = GetDeviceCaps(dc, VREFRESH);
     ReleaseDC(NULL, dc);
     return hz;
+}
+
+typedef HRESULT(WINAPI* DirectDrawCreateProc)(GUID*, IDirectDraw**, IUnknown*);
+
+uint32_t MachineVideoMemory()
+{
+    // Windows 95 may have no DirectX at all, so ddraw.dll is not imported.
+    HMODULE ddraw = LoadLibraryA("ddraw.dll");
+    if (!ddraw) return 0;
+    uint32_t total = 0;
+    DirectDrawCreateProc create = (DirectDrawCreateProc)GetProcAddress(ddraw, "DirectDrawCreate");
+    IDirectDraw* draw = NULL;
+    if (create && SUCCEEDED(create(NULL, &draw, NULL)) && draw) {
+        // The DirectX 3 form of the capabilities is the oldest that every
+        // runtime since takes.
+        DDCAPS_DX3 caps;
+        memset(&caps, 0, sizeof caps);
+        caps.dwSize = sizeof caps;
+        if (SUCCEEDED(draw->GetCaps((DDCAPS*)&caps, NULL))) total = caps.dwVidMemTotal;
+        draw->Release();
+    }
+    FreeLibrary(ddraw);
+    return total;
 }
 
 int MachineDeviceModeField(const char* device, int cap_index)

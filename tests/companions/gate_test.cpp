@@ -148,18 +148,20 @@ TEST_F(GateCompanion, MemorySizeIsAskedUntilAnsweredThenKept)
     EXPECT_LT(GetTickCount() - start, GATE_REPLY_TIMEOUT_MS / 2u) << "no wait for what did not start";
 }
 
-// The real gatectl.exe measures and answers the window it is named.
+// The simulated gatectl.exe answers the window it is named with the memory
+// of its folder's machine: 8 MB and 192 KB.
 TEST_F(GateCompanion, RealCompanionAnswersTheNamedWindow)
 {
-    uint32_t size = PackMemorySize(MeasureVideoMemory());
-    EXPECT_GE(size >> 16, 1u) << "DirectDraw knows the card's megabytes";
+    std::string folder = CopySimBuild("gate");
+    WriteTextFile(folder + "SIMMACHINE.INI", "[Machine]\r\nWindows=98\r\n[Card0]\r\nId=8086:7800\r\nBus=1\r\n"
+                                             "Device=0\r\nMemoryMB=8\r\nMemoryExtraKB=200\r\n");
     for (std::string to : {"zentra", "NoSuchCompanionsWindow"}) {
         ChildProcess gatectl;
-        ASSERT_TRUE(gatectl.Start("\"" + SimBuildFolder() + "gatectl.exe\" 3 " + to));
+        ASSERT_TRUE(gatectl.Start("\"" + folder + "gatectl.exe\" 3 " + to, folder));
         EXPECT_EQ(to == "zentra" ? 0 : 1, gatectl.WaitExit(20000)) << to;
         MSG reply;
         EXPECT_EQ(to == "zentra", PeekMessageA(&reply, main, MSG_GATE_REPLY, MSG_GATE_REPLY, PM_REMOVE)) << to;
-        if (to == "zentra") EXPECT_EQ(size, (uint32_t)reply.lParam);
+        if (to == "zentra") EXPECT_EQ((8u << 16) | 192, (uint32_t)reply.lParam);
     }
 }
 

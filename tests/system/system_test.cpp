@@ -10,15 +10,18 @@
 #include <shellapi.h>
 #include <commctrl.h>
 
+#include <fstream>
+#include <iterator>
 #include <string>
 #include <vector>
 
 #include "support/support.h"
 
 // The numbers other programs send; they never change.
-static const UINT msg_query_refresh = 1126, msg_get_refresh = 1127, msg_set_refresh = 1128;
+static const UINT msg_query_refresh = 1126, msg_get_refresh = 1127, msg_set_refresh = 1128, msg_power_state = 1134,
+                  msg_tray_callback = 1224;
 static const char card_key[] = "SOFTWARE\\QUORVEL\\PANEL\\53338901";
-static const int monitor_list_id = 1039, close_command = 209;
+static const int monitor_list_id = 1039, info_list_id = 1020, performance_slider_id = 1050, close_command = 209;
 
 static std::string MachineIni(const std::string& windows, const std::string& card = "5333:8901")
 {
@@ -45,6 +48,32 @@ static bool IconShown(HWND window)
     return Shell_NotifyIconA(NIM_MODIFY, &data);
 }
 
+// Keys to a menu window, as the keyboard gives them.
+static void PressKeys(HWND menu, const std::vector<UINT>& keys)
+{
+    for (UINT key : keys) PostMessageA(menu, WM_KEYDOWN, key, 1), PostMessageA(menu, WM_KEYUP, key, 0xC0000001);
+}
+
+// The lines of a list box on the sheet's current page, each ended by "\n".
+static std::wstring PageLines(HWND sheet, int list_id)
+{
+    HWND list = GetDlgItem((HWND)SendMessageA(sheet, PSM_GETCURRENTPAGEHWND, 0, 0), list_id);
+    std::wstring lines;
+    for (LRESULT i = 0, count = SendMessageW(list, LB_GETCOUNT, 0, 0); i < count; ++i) {
+        wchar_t text[256] = L"";
+        SendMessageW(list, LB_GETTEXT, i, (LPARAM)text);
+        lines += text + std::wstring(L"\n");
+    }
+    return lines;
+}
+
+static void CancelSheet(HWND sheet)
+{
+    PostMessageA(sheet, PSM_PRESSBUTTON, PSBTN_CANCEL, 0);
+    for (DWORD start = GetTickCount(); IsWindow(sheet) && GetTickCount() - start < 10000;) Sleep(20);
+    ASSERT_FALSE(IsWindow(sheet));
+}
+
 // A private copy of build/sim with its own machine.
 struct Panel {
     explicit Panel(const std::string& machine) : folder(CopySimBuild("panel")) { Describe(machine); }
@@ -68,14 +97,14 @@ struct Panel {
         }
         return NULL;
     }
-    // A shown top-level window of this process of that class, once it is there.
-    HWND Shown(const char* cls)
+    // A top-level window of this process of that class other than not_this, once it is shown.
+    HWND Shown(const char* cls, HWND not_this = NULL)
     {
         for (DWORD start = GetTickCount(); GetTickCount() - start < 10000; Sleep(20))
             for (HWND w = NULL; (w = FindWindowExA(NULL, w, cls, NULL));) {
                 DWORD owner = 0;
                 GetWindowThreadProcessId(w, &owner);
-                if (owner == process.info.dwProcessId && IsWindowVisible(w)) return w;
+                if (w != not_this && owner == process.info.dwProcessId && IsWindowVisible(w)) return w;
             }
         return NULL;
     }
@@ -85,14 +114,16 @@ struct Panel {
         HWND w = FindWindowA("zentra", NULL);  // none: the call fails
         return SendMessageTimeoutA(w, message, wparam, lparam, SMTO_NORMAL, 20000, &result) ? result : -12345;
     }
-    // A value of simstate.exe's report, e.g. ("Card0", "RefreshHz").
-    std::string State(const char* section, const char* key)
+    // A value of simstate.exe's report, e.g. ("Card0", "RefreshHz"): of a new one, or of the last.
+    std::string State(const char* section, const char* key, bool again = true)
     {
         std::string report = folder + "simstate.txt";
         char value[64] = "";
-        ChildProcess state;
-        DeleteFileA(report.c_str());
-        if (state.Start("cmd /c simstate.exe >simstate.txt", folder)) state.WaitExit(20000);
+        if (again) {
+            ChildProcess state;
+            DeleteFileA(report.c_str());
+            if (state.Start("cmd /c simstate.exe >simstate.txt", folder)) state.WaitExit(20000);
+        }
         GetPrivateProfileStringA(section, key, "", value, sizeof value, report.c_str());
         return value;
     }
@@ -108,9 +139,13 @@ struct Panel {
     }
     // Sets a rate 15 Hz above all Windows lists for the running mode, which
     // only the pixel clock reaches, offered by the chip file; returns it.
+    // The card's mode as simstate names it (Wine shows other processes 32 bits).
     int SetExtendedRate(const char* section, const char* key = card_key)
     {
-        DEVMODEA m = Screen();
+        DEVMODEA m = {};
+        m.dmPelsWidth = atoi(State("Card0", "Width").c_str());
+        m.dmPelsHeight = atoi(State("Card0", "Height", false).c_str());
+        m.dmBitsPerPel = atoi(State("Card0", "Bits", false).c_str());
         std::vector<int> os = QueryRates(m.dmPelsWidth, m.dmPelsHeight, m.dmBitsPerPel);
         int extended = os.empty() ? 0 : os.back() + 15;
         WritePrivateProfileStringA(section, Name(m).c_str(), std::to_string(extended).c_str(),
@@ -144,23 +179,14 @@ TEST_F(SystemTest, OnWindows98)
     EXPECT_EQ(w, FindWindowA("zentra", NULL));
     HWND menu = panel.Shown("#32768");
     ASSERT_TRUE(menu != NULL) << "no menu";
-    for (UINT key : {VK_DOWN, VK_DOWN, VK_DOWN, VK_RETURN})
-        PostMessageA(menu, WM_KEYDOWN, key, 1), PostMessageA(menu, WM_KEYUP, key, 0xC0000001);
+    PressKeys(menu, {VK_DOWN, VK_DOWN, VK_DOWN, VK_RETURN});
     HWND sheet = panel.Shown("#32770");
     ASSERT_TRUE(sheet != NULL) << "no sheet";
     // The Monitor page, read from here: the default monitor's EDID lines.
-    HWND list = GetDlgItem((HWND)SendMessageA(sheet, PSM_GETCURRENTPAGEHWND, 0, 0), monitor_list_id);
-    std::wstring lines;
-    for (LRESULT i = 0, count = SendMessageW(list, LB_GETCOUNT, 0, 0); i < count; ++i) {
-        wchar_t text[256] = L"";
-        SendMessageW(list, LB_GETTEXT, i, (LPARAM)text);
-        lines += text + std::wstring(L"\n");
-    }
-    EXPECT_NE(std::wstring::npos, lines.find(L"Year of Manufacture :\n        1998\nMax H. Image Size(cm) :\n        30\n"
-                                              L"Max V. Image Size(cm) :\n        23\n"));
-    PostMessageA(sheet, PSM_PRESSBUTTON, PSBTN_CANCEL, 0);
-    for (DWORD start = GetTickCount(); IsWindow(sheet) && GetTickCount() - start < 10000;) Sleep(20);
-    ASSERT_FALSE(IsWindow(sheet));
+    EXPECT_NE(std::wstring::npos,
+              PageLines(sheet, monitor_list_id).find(L"Year of Manufacture :\n        1998\nMax H. Image Size(cm) :\n"
+                                                     L"        30\nMax V. Image Size(cm) :\n        23\n"));
+    ASSERT_NO_FATAL_FAILURE(CancelSheet(sheet));
 
     // Other programs read the driver's rates, then the chip file's, and the rate the card runs.
     const char* modes_key = "System\\CurrentControlSet\\Services\\Class\\DISPLAY\\0000\\MODES\\8\\640,480";
@@ -226,25 +252,13 @@ TEST_F(SystemTest, OnWindowsNTTheExtendedRateComesFromThePixelClock)
 // The memory clock of simstate's report, in whole MHz.
 static int CardMhz(Panel& panel) { return (int)(atof(panel.State("Card0", "MemoryClockHz").c_str()) / 1e6 + 0.5); }
 
-// A top-level window of the panel's process of that class other than not, once it is shown.
-static HWND ShownOtherThan(Panel& panel, const char* cls, HWND not_this)
-{
-    for (DWORD start = GetTickCount(); GetTickCount() - start < 10000; Sleep(20))
-        for (HWND w = NULL; (w = FindWindowExA(NULL, w, cls, NULL));) {
-            DWORD owner = 0;
-            GetWindowThreadProcessId(w, &owner);
-            if (w != not_this && owner == panel.process.info.dwProcessId && IsWindowVisible(w)) return w;
-        }
-    return NULL;
-}
-
 // The Performance page sets the TNT's memory clock; only a kept clock is stored, and
 // "/A" after a reboot brings it back. The refresh the card runs is the one reported.
 TEST_F(SystemTest, RivaTntMemoryClockThroughThePerformancePage)
 {
     const std::string machine = "[Machine]\r\nWindows=98\r\n[Card0]\r\nId=10de:0020\r\nBus=1\r\nDevice=0\r\nMemoryMB=16\r\n";
     const char* tnt_key = "SOFTWARE\\QUORVEL\\PANEL\\10de0020";
-    const int performance_command = 223, apply_id = 1053, slider_id = 1050;
+    const int performance_command = 223, apply_id = 1053;
     Panel panel(machine);
     ASSERT_TRUE(panel.Start("win98"));
     HWND w = panel.WaitWindow();
@@ -260,9 +274,9 @@ TEST_F(SystemTest, RivaTntMemoryClockThroughThePerformancePage)
     HWND page = (HWND)SendMessageA(sheet, PSM_GETCURRENTPAGEHWND, 0, 0);
     // Chooses before + 10 MHz, applies it and answers the question.
     auto apply = [&](int answer) {
-        SendMessageA(page, WM_HSCROLL, MAKEWPARAM(TB_THUMBTRACK, before + 10), (LPARAM)GetDlgItem(page, slider_id));
+        SendMessageA(page, WM_HSCROLL, MAKEWPARAM(TB_THUMBTRACK, before + 10), (LPARAM)GetDlgItem(page, performance_slider_id));
         PostMessageA(page, WM_COMMAND, MAKEWPARAM(apply_id, BN_CLICKED), (LPARAM)GetDlgItem(page, apply_id));
-        HWND question = ShownOtherThan(panel, "#32770", sheet);
+        HWND question = panel.Shown("#32770", sheet);
         ASSERT_TRUE(question != NULL) << "no question";
         EXPECT_NEAR(before + 10, CardMhz(panel), 4);
         EXPECT_STREQ("", ReadRegistryRaw(HKEY_LOCAL_MACHINE, tnt_key, "mclk").c_str()) << "stored before the answer";
@@ -289,6 +303,66 @@ TEST_F(SystemTest, RivaTntMemoryClockThroughThePerformancePage)
     ASSERT_TRUE(panel.Start("win98", "/A"));
     ASSERT_TRUE(panel.WaitWindow());
     EXPECT_EQ(kept, CardMhz(panel));
+}
+
+// Each family on its machine of sim/machines, one start each: the menu's page
+// entries (the last opens its page, on a sheet of as many), the memory the
+// Information page shows, the rate the card runs, a rate above Windows' list
+// where the program sets the pixel clock, and the power states.
+TEST_F(SystemTest, FamiliesOnTheirMachines)
+{
+    const struct {
+        const char* machine;
+        int pages, last_page_control;
+        const wchar_t* memory;
+        const char *extended, *key;  // the chip file's section of extended rates (none: the driver's rates only)
+        bool dpms;
+    } families[] = {
+        {"banshee.ini", 3, performance_slider_id, L"16.0MB", "CHIP0003_95E", "SOFTWARE\\QUORVEL\\PANEL\\121a0003", true},
+        {"i740.ini", 3, monitor_list_id, L"8.0MB", "CHIP7800_95E", "SOFTWARE\\QUORVEL\\PANEL\\80867800", true},
+        {"permedia2.ini", 2, info_list_id, L"8.0MB", NULL, NULL, false},
+    };
+    for (const auto& f : families) {
+        SCOPED_TRACE(f.machine);
+        std::ifstream file(std::string("Z:" VISTREL_MACHINES "/") + f.machine);
+        Panel panel(std::string(std::istreambuf_iterator<char>(file), {}));
+        ASSERT_TRUE(panel.Start("win98"));
+        HWND w = panel.WaitWindow();
+        ASSERT_TRUE(w);
+        EXPECT_NEAR(panel.RefreshHz(), (double)panel.Send(msg_get_refresh, 0), 1.0);
+
+        PostMessageA(w, msg_tray_callback, 0, WM_LBUTTONDOWN);
+        HWND menu = panel.Shown("#32768");
+        ASSERT_TRUE(menu) << "no menu";
+        std::vector<UINT> keys(f.pages, VK_DOWN);
+        keys.push_back(VK_RETURN);
+        PressKeys(menu, keys);
+        HWND sheet = panel.Shown("#32770");
+        ASSERT_TRUE(sheet) << "no sheet";
+        EXPECT_TRUE(GetDlgItem((HWND)SendMessageA(sheet, PSM_GETCURRENTPAGEHWND, 0, 0), f.last_page_control));
+        EXPECT_EQ(f.pages, SendMessageA((HWND)SendMessageA(sheet, PSM_GETTABCONTROL, 0, 0), TCM_GETITEMCOUNT, 0, 0));
+        SendMessageA(sheet, PSM_SETCURSEL, 1, 0);
+        std::wstring information = PageLines(sheet, info_list_id);
+        std::erase(information, L' ');
+        EXPECT_NE(std::wstring::npos, information.find(L"VGAMemory:\n" + std::wstring(f.memory) + L"\n"));
+        ASSERT_NO_FATAL_FAILURE(CancelSheet(sheet));
+        if (f.dpms) {
+            PostMessageA(w, msg_tray_callback, 0, WM_LBUTTONDOWN);
+            ASSERT_TRUE(menu = panel.Shown("#32768"));
+            keys.back() = VK_DOWN;
+            keys.push_back(VK_RIGHT);
+            PressKeys(menu, keys);
+            EXPECT_TRUE(panel.Shown("#32768", menu)) << "no power saving submenu";
+            PressKeys(menu, {VK_ESCAPE, VK_ESCAPE});
+        }
+
+        if (f.extended) panel.SetExtendedRate(f.extended, f.key);
+        const struct { WPARAM state; const char* seen; } steps[] = {{1, "Standby"}, {2, "Suspend"}, {4, "Off"}, {0, "On"}};
+        for (const auto& s : steps) {
+            EXPECT_EQ(1, panel.Send(msg_power_state, s.state));
+            EXPECT_EQ(f.dpms ? s.seen : "On", panel.State("Card0", "DPMS")) << s.state;
+        }
+    }
 }
 
 TEST_F(SystemTest, NoSupportedCardShowsTheTextAndEnds)
