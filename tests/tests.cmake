@@ -26,6 +26,7 @@ vistrel_add_test(modes modes)
 
 # vistrel-sim.exe as a process of its own, seen from outside.
 vistrel_test(system)
+target_compile_definitions(test-system PRIVATE VISTREL_MACHINES="${VISTREL_ROOT}/sim/machines")
 vistrel_add_test(system system TIMEOUT 600)
 
 vistrel_test(hardware)

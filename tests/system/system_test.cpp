@@ -10,6 +10,8 @@
 #include <shellapi.h>
 #include <commctrl.h>
 
+#include <fstream>
+#include <sstream>
 #include <string>
 #include <vector>
 
@@ -17,8 +19,9 @@
 
 // The numbers other programs send; they never change.
 static const UINT msg_query_refresh = 1126, msg_get_refresh = 1127, msg_set_refresh = 1128;
+static const UINT msg_power_state = 1134, msg_tray_callback = 1224;
 static const char card_key[] = "SOFTWARE\\QUORVEL\\PANEL\\53338901";
-static const int monitor_list_id = 1039, close_command = 209;
+static const int monitor_list_id = 1039, information_list_id = 1020, close_command = 209;
 
 static std::string MachineIni(const std::string& windows, const std::string& card = "5333:8901")
 {
@@ -37,6 +40,23 @@ static DEVMODEA Screen()
 static std::string Name(const DEVMODEA& m)
 {
     return std::to_string(m.dmPelsWidth) + "x" + std::to_string(m.dmPelsHeight) + "x" + std::to_string(m.dmBitsPerPel);
+}
+
+// The lines of another process's list box, each with '\n' after it.
+static std::wstring ListLines(HWND list)
+{
+    std::wstring lines;
+    for (LRESULT i = 0, count = SendMessageW(list, LB_GETCOUNT, 0, 0); i < count; ++i) {
+        wchar_t text[256] = L"";
+        SendMessageW(list, LB_GETTEXT, i, (LPARAM)text);
+        lines += text + std::wstring(L"\n");
+    }
+    return lines;
+}
+
+static void Keys(HWND w, std::initializer_list<UINT> keys)
+{
+    for (UINT key : keys) PostMessageA(w, WM_KEYDOWN, key, 1), PostMessageA(w, WM_KEYUP, key, 0xC0000001);
 }
 
 static bool IconShown(HWND window)
@@ -144,18 +164,11 @@ TEST_F(SystemTest, OnWindows98)
     EXPECT_EQ(w, FindWindowA("zentra", NULL));
     HWND menu = panel.Shown("#32768");
     ASSERT_TRUE(menu != NULL) << "no menu";
-    for (UINT key : {VK_DOWN, VK_DOWN, VK_DOWN, VK_RETURN})
-        PostMessageA(menu, WM_KEYDOWN, key, 1), PostMessageA(menu, WM_KEYUP, key, 0xC0000001);
+    Keys(menu, {VK_DOWN, VK_DOWN, VK_DOWN, VK_RETURN});
     HWND sheet = panel.Shown("#32770");
     ASSERT_TRUE(sheet != NULL) << "no sheet";
     // The Monitor page, read from here: the default monitor's EDID lines.
-    HWND list = GetDlgItem((HWND)SendMessageA(sheet, PSM_GETCURRENTPAGEHWND, 0, 0), monitor_list_id);
-    std::wstring lines;
-    for (LRESULT i = 0, count = SendMessageW(list, LB_GETCOUNT, 0, 0); i < count; ++i) {
-        wchar_t text[256] = L"";
-        SendMessageW(list, LB_GETTEXT, i, (LPARAM)text);
-        lines += text + std::wstring(L"\n");
-    }
+    std::wstring lines = ListLines(GetDlgItem((HWND)SendMessageA(sheet, PSM_GETCURRENTPAGEHWND, 0, 0), monitor_list_id));
     EXPECT_NE(std::wstring::npos, lines.find(L"Year of Manufacture :\n        1998\nMax H. Image Size(cm) :\n        30\n"
                                               L"Max V. Image Size(cm) :\n        23\n"));
     PostMessageA(sheet, PSM_PRESSBUTTON, PSBTN_CANCEL, 0);
@@ -289,6 +302,92 @@ TEST_F(SystemTest, RivaTntMemoryClockThroughThePerformancePage)
     ASSERT_TRUE(panel.Start("win98", "/A"));
     ASSERT_TRUE(panel.WaitWindow());
     EXPECT_EQ(kept, CardMhz(panel));
+}
+
+// A machine of sim/machines, as the tour and the user start it.
+static std::string MachineFile(const char* name)
+{
+    std::ifstream in(std::string("Z:" VISTREL_MACHINES "/") + name);
+    std::stringstream text;
+    text << in.rdbuf();
+    return text.str();
+}
+
+// A window of the panel's that the closing command's question is, once shown.
+static HWND Question(Panel& panel)
+{
+    HWND w = panel.Shown("#32770");
+    return w && GetDlgItem(w, IDYES) ? w : NULL;
+}
+
+static void WaitGone(HWND w)
+{
+    for (DWORD start = GetTickCount(); IsWindow(w) && GetTickCount() - start < 10000;) Sleep(20);
+}
+
+// Each family on its machine: the menu's entries (Down through all of them
+// ends on Close, which asks) and pages, the refresh the card runs, a rate the
+// pixel clock reaches or else one of the display driver's, and the monitor's
+// power state as the card has it after "off" and "on".
+TEST_F(SystemTest, FamiliesOnTheirMachines)
+{
+    const struct {
+        const char *machine, *version;
+        int menu_entries, pages;
+        const wchar_t* memory;  // the Information page's memory value
+        const char *extended_section, *key;
+        const char* dpms_after_off;
+    } families[] = {
+        {"trident.ini", "win98", 8, 3, L"4.0 MB SGRAM", NULL, "SOFTWARE\\QUORVEL\\PANEL\\1023939a", "Off"},
+        {"et6000.ini", "win95", 8, 3, L"2.256 MB", "CHIP3208_95E", "SOFTWARE\\QUORVEL\\PANEL\\100c3208", "On"},
+    };
+    for (const auto& f : families) {
+        SCOPED_TRACE(f.machine);
+        ClearSettingsStore();
+        Panel panel(MachineFile(f.machine));
+        ASSERT_TRUE(panel.Start(f.version));
+        HWND w = panel.WaitWindow();
+        ASSERT_TRUE(w);
+        EXPECT_NEAR(panel.RefreshHz(), (double)panel.Send(msg_get_refresh, 0), 1.0);
+        if (f.extended_section) {
+            panel.SetExtendedRate(f.extended_section, f.key);
+        } else {
+            DEVMODEA m = Screen();
+            std::vector<int> os = panel.QueryRates(m.dmPelsWidth, m.dmPelsHeight, m.dmBitsPerPel);
+            ASSERT_GE(os.size(), 2u);
+            int other = os[0] == (int)panel.Send(msg_get_refresh, 0) ? os[1] : os[0];
+            EXPECT_EQ(1, panel.Send(msg_set_refresh, other));
+            EXPECT_NEAR(other, panel.RefreshHz(), 1.0);
+            EXPECT_EQ(other, (int)panel.Send(msg_get_refresh, 0));
+        }
+        panel.Send(msg_power_state, 4);
+        EXPECT_EQ(f.dpms_after_off, panel.State("Card0", "DPMS"));
+        panel.Send(msg_power_state, 0);
+        EXPECT_EQ("On", panel.State("Card0", "DPMS"));
+
+        PostMessageA(w, msg_tray_callback, 0, WM_LBUTTONDOWN);
+        HWND menu = panel.Shown("#32768");
+        ASSERT_TRUE(menu != NULL) << "no menu";
+        for (int i = 0; i < f.menu_entries; ++i) Keys(menu, {VK_DOWN});
+        Keys(menu, {VK_RETURN});
+        HWND question = Question(panel);
+        ASSERT_TRUE(question != NULL) << "the last entry is not Close";
+        PostMessageA(question, WM_COMMAND, IDNO, 0);
+        WaitGone(question);
+        WaitGone(menu);
+        PostMessageA(w, msg_tray_callback, 0, WM_LBUTTONDOWN);
+        menu = panel.Shown("#32768");
+        ASSERT_TRUE(menu != NULL) << "no menu";
+        Keys(menu, {VK_DOWN, VK_DOWN, VK_RETURN});
+        HWND sheet = panel.Shown("#32770");
+        ASSERT_TRUE(sheet != NULL) << "no sheet";
+        EXPECT_EQ(f.pages, SendMessageA((HWND)SendMessageA(sheet, PSM_GETTABCONTROL, 0, 0), TCM_GETITEMCOUNT, 0, 0));
+        std::wstring lines =
+            ListLines(GetDlgItem((HWND)SendMessageA(sheet, PSM_GETCURRENTPAGEHWND, 0, 0), information_list_id));
+        EXPECT_NE(std::wstring::npos, lines.find(L"VGA Memory :\n              " + std::wstring(f.memory) + L"\n"));
+        PostMessageA(sheet, PSM_PRESSBUTTON, PSBTN_CANCEL, 0);
+        WaitGone(sheet);
+    }
 }
 
 TEST_F(SystemTest, NoSupportedCardShowsTheTextAndEnds)
