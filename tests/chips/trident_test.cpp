@@ -7,9 +7,11 @@
 
 namespace {
 
-void BootTrident(int windows = SIM_WINDOWS_98)
+void BootTrident(uint32_t memory_mb = 4)
 {
-    BootMachine(Machine(windows, {Card(0x1023, 0x939a)}));
+    SimCardConfig card = Card(0x1023, 0x939a);
+    card.memory_mb = memory_mb;
+    BootMachine(Machine(SIM_WINDOWS_98, {card}));
     ASSERT_EQ(1, DetectAdapters());
 }
 
@@ -17,13 +19,15 @@ uint8_t Seq(uint16_t index) { return SimReadRegister(0, SIM_REG_SEQUENCER, index
 void SetSeq(uint16_t index, uint8_t value) { SimWriteRegister(0, SIM_REG_SEQUENCER, index, value); }
 void SetCrtc(uint16_t index, uint8_t value) { SimWriteRegister(0, SIM_REG_CRTC, index, value); }
 
-// The 4 MB SGRAM card as it resets, then other codes: only the listed ones tell
-// a size or a type; other bits of the registers do not count.
+// SGRAM cards of each size as they reset, then other codes: only the listed
+// ones tell a size or a type; other bits of the registers do not count.
 TEST(Trident, MemorySizeAndTypeCodes)
 {
-    ASSERT_NO_FATAL_FAILURE(BootTrident());
-    EXPECT_EQ(4u << 16, chip_get_mem_size());
-    EXPECT_EQ(4u, chip_get_mem_type());
+    for (uint32_t mb : {1u, 2u, 8u, 4u}) {
+        ASSERT_NO_FATAL_FAILURE(BootTrident(mb));
+        EXPECT_EQ(mb << 16, chip_get_mem_size());
+        EXPECT_EQ(4u, chip_get_mem_type());
+    }
     const struct { uint8_t cr1f, cr2a; uint32_t size, type; } cases[] = {
         {0x27, 0x0C, 2u << 16, 4}, {0x05, 0x00, 0, 0},      {0x03, 0xF4, 1u << 16, 2},
         {0xF4, 0x08, 8u << 16, 3}, {0x0F, 0xF3, 4u << 16, 0},

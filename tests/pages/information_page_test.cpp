@@ -260,25 +260,3 @@ TEST(InformationPage, StartUpBoxAndRebuilds)
 }
 
 }  // namespace
-
-// The memory line as the cards give it: the Trident's size and type codes, the
-// ET6000's video BIOS on Windows 95.
-TEST(InformationPage, MemoryLineFromTheCard)
-{
-    const struct { int windows; uint16_t vendor, device; uint32_t mb, extra_kb; int cr2a; const char* line; } cases[] = {
-        {SIM_WINDOWS_98, 0x1023, 0x939a, 4, 0, -1, "|VGA Memory :|~4.0 MB SGRAM|"},
-        {SIM_WINDOWS_98, 0x1023, 0x939a, 2, 0, 0x00, "|VGA Memory :|~2.0 MB|"},
-        {SIM_WINDOWS_95, 0x100c, 0x3208, 2, 256, -1, "|VGA Memory :|~2.256 MB|"},
-    };
-    for (const auto& c : cases) {
-        SimCardConfig card = Card(c.vendor, c.device);
-        card.memory_mb = c.mb;
-        card.memory_extra_kb = c.extra_kb;
-        BootMachine(Machine(c.windows, {card}));
-        ASSERT_EQ(1, DetectAdapters());
-        if (c.cr2a >= 0) SimWriteRegister(0, SIM_REG_CRTC, 0x2A, (uint8_t)c.cr2a);
-        std::string lines;
-        EXPECT_TRUE(RunSheet(PAGE_INFORMATION, [&](HWND sheet) { lines = ListLines(Page(sheet)); }));
-        EXPECT_NE(std::string::npos, lines.find(c.line)) << lines;
-    }
-}
