@@ -70,6 +70,9 @@ TEST(Et6000, SynthesizerThroughThePortsCr21Names)
     ASSERT_NO_FATAL_FAILURE(BootEt6000(SIM_WINDOWS_98));
     MachineOutByte(0x3D4, 0x21);
     EXPECT_EQ(io_base >> 8, MachineInByte(0x3D5));
+    // Bit 8 of the horizontal total and bit 10 of the vertical, which no mode of the list has.
+    SimWriteRegister(0, SIM_REG_CRTC, 0x3F, SimReadRegister(0, SIM_REG_CRTC, 0x3F) | 0x01);
+    SimWriteRegister(0, SIM_REG_CRTC, 0x35, SimReadRegister(0, SIM_REG_CRTC, 0x35) | 0x02);
     const struct { uint8_t misc_select, cr34, number; } clocks[] = {{2, 0x00, 2}, {1, 0x02, 5}};
     for (const auto& c : clocks) {
         SimWriteRegister(0, SIM_REG_MISC, 0, (uint8_t)((SimReadRegister(0, SIM_REG_MISC, 0) & ~0x0C) | c.misc_select << 2));
