@@ -221,6 +221,7 @@ void SimDefaultMachine(SimMachineConfig* config)
     config->monitors = 0;
     config->nt_device = true;
     config->vxd_device = true;
+    config->video_bios = true;
 }
 
 int SimReadDescription(const char* path, SimMachineConfig* config)
@@ -243,6 +244,7 @@ int SimReadDescription(const char* path, SimMachineConfig* config)
         ParseMode(text, &config->start_width, &config->start_height, &config->start_bits, &config->start_refresh);
     ReadBool(&p, "KernelDevice", &config->nt_device);
     ReadBool(&p, "MappingDevice", &config->vxd_device);
+    ReadBool(&p, "VideoBios", &config->video_bios);
 
     config->card_count = 0;
     config->primary_card = -1;

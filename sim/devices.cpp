@@ -186,7 +186,7 @@ BOOL MachineCloseDevice(HANDLE device)
 int MachineVideoBios(BiosRegisters* regs)
 {
     int card = SimPrimaryCard();
-    if (card < 0 || sim->config.windows == SIM_WINDOWS_NT4 || !regs) return 0;
+    if (card < 0 || sim->config.windows == SIM_WINDOWS_NT4 || !sim->config.video_bios || !regs) return 0;
     if (regs->ax != 0x1203 || (regs->bx & 0xFF) != 0xF2) return 0;
     if (SimCardChip(card)->family != SIM_FAMILY_ET6000) return 0;
     regs->bx = Et6000BiosMemory(card);

@@ -311,4 +311,6 @@ const SimFamilyOps sim_et6000_ops = {
     .read_port = ReadPort,
     .write_port = WritePort,
     .print_raw = PrintRaw,
+    .read_internal32 = NULL,
+    .write_internal32 = NULL,
 };

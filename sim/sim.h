@@ -83,6 +83,7 @@ struct SimMachineConfig {
     int monitors;
     bool nt_device;   // NT: the kernel device "\\.\Zentra" is installed
     bool vxd_device;  // 9x: "\\.\HWGATE.VXD" can be loaded
+    bool video_bios;  // 9x: the primary card's video BIOS answers the program
 };
 
 // One S3 Trio64V2 (5333:8901) on bus 0 device 10 with 4 MB and a 17-inch

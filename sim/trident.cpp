@@ -253,4 +253,6 @@ const SimFamilyOps sim_trident_ops = {
     .read_port = NULL,
     .write_port = NULL,
     .print_raw = PrintRaw,
+    .read_internal32 = NULL,
+    .write_internal32 = NULL,
 };

@@ -260,15 +260,3 @@ TEST(InformationPage, StartUpBoxAndRebuilds)
 }
 
 }  // namespace
-
-// The memory line carries the chip's memory type word.
-TEST(InformationPage, MemoryTypeWord)
-{
-    BootMachine(Machine(SIM_WINDOWS_98, {Card(0x1023, 0x939a)}));
-    ASSERT_EQ(1, DetectAdapters());
-    SimWriteRegister(0, SIM_REG_CRTC, 0x1F, 0x0F);
-    SimWriteRegister(0, SIM_REG_CRTC, 0x2A, 0x0C);
-    std::string lines;
-    EXPECT_TRUE(RunSheet(PAGE_INFORMATION, [&](HWND sheet) { lines = ListLines(Page(sheet)); }));
-    EXPECT_NE(std::string::npos, lines.find("|VGA Memory :|~4.0 MB SGRAM|")) << lines;
-}

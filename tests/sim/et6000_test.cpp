@@ -1,15 +1,12 @@
 // The ET6000 model: the CLKDAC in the PCI I/O range found through CR21,
-// the clock number, DPMS, memory configuration and the BIOS's memory
-// answer, and the display driver's mode set read back from the registers.
+// the clock number, DPMS, and the display driver's mode set read back from
+// the registers.
 #include "modes.h"
 #include "sim_test.h"
 
-static void BootEt6000(int windows = SIM_WINDOWS_98, int memory_mb = 4, int extra_kb = 0)
+static void BootEt6000(int windows = SIM_WINDOWS_98)
 {
-    SimCardConfig card = Card(0x100c, 0x3208);
-    card.memory_mb = memory_mb;
-    card.memory_extra_kb = extra_kb;
-    SimMachineConfig config = Machine(windows, {card});
+    SimMachineConfig config = Machine(windows, {Card(0x100c, 0x3208)});
     config.start_bits = 8;
     SimBoot(&config);
 }
@@ -46,26 +43,6 @@ TEST(Et6000, DpmsFromCr34)
     for (const auto& c : cases) {
         WriteCr(0x34, c.cr34);
         EXPECT_EQ(c.state, SimDpmsState(0)) << std::hex << (int)c.cr34;
-    }
-}
-
-// The BIOS finds memory in 64 KB blocks; the MDRAM configuration counts
-// banks of 256 or 512 KB and reads 2.25 MB as 2.5 (X.org tseng).
-TEST(Et6000, MemoryAnswers)
-{
-    const struct { int windows, mb, extra_kb; uint16_t bx; uint8_t banks, doubled; } cases[] = {
-        {SIM_WINDOWS_95, 2, 256, 0x0024, 4, 0x04},
-        {SIM_WINDOWS_95, 1, 0, 0x0010, 3, 0x00},
-        {SIM_WINDOWS_NT4, 4, 0, 0, 7, 0x04},
-    };
-    for (const auto& c : cases) {
-        BootEt6000(c.windows, c.mb, c.extra_kb);
-        BiosRegisters regs = {.ax = 0x1203, .bx = 0x00F2, .cx = 0, .dx = 0};
-        EXPECT_EQ(c.bx != 0, MachineVideoBios(&regs) != 0);
-        if (c.bx) EXPECT_EQ(c.bx, regs.bx);
-        EXPECT_EQ(c.banks, MachineInByte(IoPort(0x47)) & 0x07);
-        EXPECT_EQ(c.doubled, MachineInByte(IoPort(0x45)) & 0x04);
-        EXPECT_EQ(3, MachineInByte(0x3C2) & 0x03) << "MDRAM";
     }
 }
 

@@ -1,6 +1,5 @@
-// The Trident model: memory codes through the register window, the
-// synthesizer pair CR2F chooses, DPMS, and the display driver's mode set
-// read back from the registers.
+// The Trident model: the synthesizer pair CR2F chooses, DPMS, and the
+// display driver's mode set read back from the registers.
 #include "modes.h"
 #include "sim_test.h"
 
@@ -11,22 +10,6 @@ static void BootTrident(int memory_mb = 4, int windows = SIM_WINDOWS_98)
     SimMachineConfig config = Machine(windows, {card});
     config.start_bits = 8;
     SimBoot(&config);
-}
-// A CRT register through the register window (BAR1 + port).
-static uint8_t WindowCr(uint8_t index)
-{
-    MachineWriteByte(SimCardBarAddress(0, 1) + 0x3D4, index);
-    return MachineReadByte(SimCardBarAddress(0, 1) + 0x3D5);
-}
-
-TEST(Trident, MemorySizeAndTypeCodes)
-{
-    const struct { int mb; uint8_t code; } cases[] = {{1, 0x3}, {2, 0x7}, {4, 0xF}, {8, 0x4}};
-    for (const auto& c : cases) {
-        BootTrident(c.mb);
-        EXPECT_EQ(c.code, WindowCr(0x1F) & 0x0F) << c.mb;
-        EXPECT_EQ(0x0C, ReadCr(0x2A) & 0x0C) << "SGRAM";
-    }
 }
 
 // SR18 = 90, SR19 = N 5, R 1: 14.31818 MHz x 98 / (7 x 2).

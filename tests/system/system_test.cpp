@@ -312,21 +312,23 @@ TEST_F(SystemTest, RivaTntMemoryClockThroughThePerformancePage)
 TEST_F(SystemTest, FamiliesOnTheirMachines)
 {
     const struct {
-        const char* machine;
+        const char *machine, *version;
         int pages, last_page_control;
         const wchar_t* memory;
         const char *extended, *key;  // the chip file's section of extended rates (none: the driver's rates only)
-        bool dpms;
+        bool power_menu, dpms;       // the menu's power-saving entry; the card's syncs follow MSG_POWER_STATE
     } families[] = {
-        {"banshee.ini", 3, performance_slider_id, L"16.0MB", "CHIP0003_95E", "SOFTWARE\\QUORVEL\\PANEL\\121a0003", true},
-        {"i740.ini", 3, monitor_list_id, L"8.0MB", "CHIP7800_95E", "SOFTWARE\\QUORVEL\\PANEL\\80867800", true},
-        {"permedia2.ini", 2, info_list_id, L"8.0MB", NULL, NULL, false},
+        {"banshee.ini", "win98", 3, performance_slider_id, L"16.0MB", "CHIP0003_95E", "SOFTWARE\\QUORVEL\\PANEL\\121a0003", true, true},
+        {"i740.ini", "win98", 3, monitor_list_id, L"8.0MB", "CHIP7800_95E", "SOFTWARE\\QUORVEL\\PANEL\\80867800", true, true},
+        {"permedia2.ini", "win98", 2, info_list_id, L"8.0MB", NULL, NULL, false, false},
+        {"trident.ini", "win98", 3, monitor_list_id, L"4.0MBSGRAM", NULL, NULL, false, true},
+        {"et6000.ini", "win95", 3, monitor_list_id, L"2.256MB", "CHIP3208_95E", "SOFTWARE\\QUORVEL\\PANEL\\100c3208", false, false},
     };
     for (const auto& f : families) {
         SCOPED_TRACE(f.machine);
         std::ifstream file(std::string("Z:" VISTREL_MACHINES "/") + f.machine);
         Panel panel(std::string(std::istreambuf_iterator<char>(file), {}));
-        ASSERT_TRUE(panel.Start("win98"));
+        ASSERT_TRUE(panel.Start(f.version));
         HWND w = panel.WaitWindow();
         ASSERT_TRUE(w);
         EXPECT_NEAR(panel.RefreshHz(), (double)panel.Send(msg_get_refresh, 0), 1.0);
@@ -346,7 +348,7 @@ TEST_F(SystemTest, FamiliesOnTheirMachines)
         std::erase(information, L' ');
         EXPECT_NE(std::wstring::npos, information.find(L"VGAMemory:\n" + std::wstring(f.memory) + L"\n"));
         ASSERT_NO_FATAL_FAILURE(CancelSheet(sheet));
-        if (f.dpms) {
+        if (f.power_menu) {
             PostMessageA(w, msg_tray_callback, 0, WM_LBUTTONDOWN);
             ASSERT_TRUE(menu = panel.Shown("#32768"));
             keys.back() = VK_DOWN;
