@@ -22,6 +22,7 @@ add_test(NAME product-pe COMMAND ${VISTREL_ROOT}/tools/check-product-pe ${VISTRE
 vistrel_test(chips)
 vistrel_add_test(chips chips)
 vistrel_test(modes)
+target_compile_definitions(test-modes PRIVATE VISTREL_RESOURCES="${VISTREL_ROOT}/resources")
 vistrel_add_test(modes modes)
 
 # vistrel-sim.exe as a process of its own, seen from outside.

@@ -182,3 +182,33 @@ TEST_F(ModeChange, RedrawsReapplyAfterThreeQuietSeconds)
     }
     DestroyWindow(window);
 }
+
+// Every rate the shipped chip file offers beyond Windows' lists runs on its family's card.
+TEST_F(ModeChange, ShippedExtendedRatesRunOnTheirCards)
+{
+    const struct { uint16_t vendor_id, device_id; uint8_t bus; } cards[] = {
+        {0x12d2, 0x0018, 0}, {0x10de, 0x0020, 1}, {0x121a, 0x0003, 0}, {0x8086, 0x7800, 1}, {0x100c, 0x3208, 0}};
+    lstrcpynA(chip_ini_path, "Z:" VISTREL_RESOURCES "/ZNTR3.INI", sizeof chip_ini_path);
+    for (const auto& c : cards) {
+        SimCardConfig card = Card(c.vendor_id, c.device_id, c.bus, c.bus ? 0 : 10);
+        card.memory_mb = 4;
+        BootMachine(Machine(SIM_WINDOWS_98, {card}));
+        lstrcpynA(chip_ini_path, "Z:" VISTREL_RESOURCES "/ZNTR3.INI", sizeof chip_ini_path);
+        ASSERT_EQ(1, DetectAdapters());
+        RefreshAdapterModes(REFRESH_AT_STARTUP);
+        char section[32], keys[2048] = "";
+        snprintf(section, sizeof section, "CHIP%04x_95E", c.device_id);
+        ASSERT_GT(GetPrivateProfileSectionA(section, keys, sizeof keys, chip_ini_path), 0u) << section;
+        for (const char* line = keys; *line; line += strlen(line) + 1) {
+            int width, height, bits, consumed = 0;
+            ASSERT_EQ(3, sscanf(line, "%dx%dx%d=%n", &width, &height, &bits, &consumed)) << line;
+            ASSERT_EQ(DISP_CHANGE_SUCCESSFUL,
+                      ApplyDisplayMode(NULL, DM_PELSWIDTH | DM_PELSHEIGHT | DM_BITSPERPEL, width, height, bits, 96, 96, 0))
+                << section << " " << line;
+            for (const char* rate = line + consumed; *rate; rate += strcspn(rate, ",") + (rate[strcspn(rate, ",")] != 0)) {
+                EXPECT_EQ(1, SetRefreshRate(atoi(rate))) << section << " " << line;
+                EXPECT_NEAR(atoi(rate), SimRefreshHz(0), 1.5) << section << " " << line;
+            }
+        }
+    }
+}
