@@ -20,6 +20,8 @@ static const DWORD interlaced_display_flag = 2;
 static const int nt_safe_rate = 60;
 
 static int Distance(int a, int b) { return a > b ? a - b : b - a; }
+// Hz between a rate and the one running beyond which it is not reached.
+static const int rate_not_reached = 5;
 
 bool RefreshCloseEnough(int target, int current)
 {
@@ -101,7 +103,7 @@ int SetRefreshRate(int target)
     }
     current = MeasuredRefreshRate();
     // A rate the clock could not reach is not running: nothing to keep.
-    if ((max < target || Distance(current, target) > 5) && !ProgramRefreshClock(target)) return 0;
+    if ((max < target || Distance(current, target) > rate_not_reached) && !ProgramRefreshClock(target)) return 0;
     SaveMode(target, a->width, a->height, a->bits_per_pixel);
     a->refresh_hz = (uint16_t)target;
     return 1;
@@ -115,8 +117,15 @@ int ProgramRefreshClock(int rate)
     uint32_t h = chip_get_htotal();
     uint32_t v = chip_get_vtotal();
     uint32_t c = chip_get_char_width();
-    double hz = (double)rate * c * h * v;
-    uint32_t ok = chip_set_pixel_clock(hz);
+    double per_frame = (double)c * h * v;
+    double before = chip_get_pixel_clock();
+    uint32_t ok = chip_set_pixel_clock(rate * per_frame);
+    // A synthesizer may take a setting far from the one asked for: that rate
+    // is not running, and the clock goes back to where it was.
+    if (ok && per_frame > 0 && Distance((int)(chip_get_pixel_clock() / per_frame + 0.5), rate) > rate_not_reached) {
+        chip_set_pixel_clock(before);
+        ok = 0;
+    }
     chip_close_io();
     return ok ? rate : 0;
 }

@@ -212,3 +212,21 @@ TEST_F(ModeChange, ShippedExtendedRatesRunOnTheirCards)
         }
     }
 }
+
+// The i740's synthesizer takes 71 MHz for the 80 MHz of 800x600 at 120 Hz: that rate is
+// refused and not stored, and the card runs the display driver's own top rate, as the program believes.
+TEST_F(ModeChange, ASettingFarFromTheRateIsTakenBack)
+{
+    BootMachine(Machine(SIM_WINDOWS_98, {Card(0x8086, 0x7800, 1, 0)}));
+    ASSERT_EQ(1, DetectAdapters());
+    RefreshAdapterModes(REFRESH_AT_STARTUP);
+    std::string ini = MakeScratchFolder("modechange") + "ZNTR3.INI";
+    WritePrivateProfileStringA("CHIP7800_95E", "800x600x8", "120", ini.c_str());
+    lstrcpynA(chip_ini_path, ini.c_str(), sizeof chip_ini_path);
+    ASSERT_EQ(DISP_CHANGE_SUCCESSFUL, ApplyDisplayMode(NULL, DM_PELSWIDTH | DM_PELSHEIGHT | DM_BITSPERPEL, 800, 600, 8, 96, 96, 0));
+    ClearSettingsStore();
+    EXPECT_EQ(0, SetRefreshRate(120));
+    EXPECT_EQ(-1, LoadSetting(SETTING_REFRESH));
+    EXPECT_NEAR(MaxRefreshRate(800, 600, 8), SimRefreshHz(0), 1.0);
+    EXPECT_NEAR(MeasuredRefreshRate(), SimRefreshHz(0), 1.0);
+}
