@@ -17,12 +17,7 @@ namespace {
 
 const char indent[] = "              ";
 
-// Lines joined by '|', the value indent shown as '~'.
-void Append(std::string* all, const char* line)
-{
-    bool indented = strncmp(line, indent, sizeof indent - 1) == 0;
-    *all += (all->empty() ? "" : "|") + (indented ? "~" + std::string(line + sizeof indent - 1) : std::string(line));
-}
+void Append(std::string* all, const char* line) { AppendLine(all, line, indent); }
 
 std::string Beside(const char* name)
 {

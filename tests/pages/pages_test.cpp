@@ -262,13 +262,7 @@ TEST(MonitorPage, ButtonsAndTimers)
 
 const EdidTexts texts = {"Year:", "H:", "V:", "DPMS:", "Stand By", "Suspend", "Shutoff", "Resolutions:"};
 
-// Lines are joined by '|', the list's indent shown as '~'.
-void Append(std::string* all, const char* line)
-{
-    size_t indent = strlen(monitor_list_indent);
-    bool indented = strncmp(line, monitor_list_indent, indent) == 0;
-    *all += (all->empty() ? "" : "|") + (indented ? "~" + std::string(line + indent) : std::string(line));
-}
+void Append(std::string* all, const char* line) { AppendLine(all, line, monitor_list_indent); }
 
 TEST(Edid, RealMonitorsDecodeAsTheirTableSays)
 {

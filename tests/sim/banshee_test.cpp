@@ -1,6 +1,5 @@
 // The Banshee model: its synthesizers and memory set-up from known register
-// values, the DAC mode's sync bits, and the display driver's mode set read
-// back from the registers, 2X mode included.
+// values, and the display driver's mode set read back from the registers.
 #include "modes.h"
 #include "sim_test.h"
 
@@ -36,19 +35,6 @@ TEST(Banshee, SynthesizersAndMemorySize)
     }
 }
 
-// dacMode bit 3 stops the horizontal sync, bit 1 the vertical one (Haiku's
-// accelerant, the 3dfx documents); bits 4 and 2 are the forced levels. The
-// driver's own states are held against these in tests/chips.
-TEST(Banshee, DpmsFromTheDacMode)
-{
-    BootBanshee();
-    const struct { uint32_t dac_mode; SimDpms state; } cases[] = {{0x15, SIM_DPMS_ON}, {0x0A, SIM_DPMS_OFF}};
-    for (const auto& c : cases) {
-        MachineWriteDword(Bar0() + DAC_MODE, c.dac_mode);
-        EXPECT_EQ(c.state, SimDpmsState(0)) << std::hex << c.dac_mode;
-    }
-}
-
 // The driver's mode set read back from CR00/CR1A, CR06/CR07/CR1B and
 // pllCtrl0: below 1600 pixels no 2X mode, whatever the clock (2X mode's
 // count is held against the driver's in tests/chips).
@@ -57,17 +43,11 @@ TEST(Banshee, DmtModesRunAtTheirRates)
     const struct { int w, h, hz, bits; } cases[] = {{640, 480, 60, 8}, {1024, 768, 85, 16}, {1280, 1024, 85, 8}};
     for (const auto& c : cases) {
         BootBanshee(16, SIM_WINDOWS_NT4);
-        ASSERT_TRUE(SimSetCardMode(0, c.w, c.h, c.bits, c.hz)) << c.w << "x" << c.h << "@" << c.hz;
-        const SimTiming* t = SimFindTiming(c.w, c.h, c.hz, false);
-        EXPECT_EQ(t->htotal / 8, SimHTotal(0));
-        EXPECT_EQ(t->vtotal, SimVTotal(0));
-        EXPECT_NEAR(SimTimingFrameRate(t), SimRefreshHz(0), 1.0) << c.w << "x" << c.h << "@" << c.hz;
+        const SimTiming* t;
+        ASSERT_NO_FATAL_FAILURE(SetDmtMode(c.w, c.h, c.bits, c.hz, &t));
         EXPECT_EQ(0u, SimReadInternal32(0, VID_PROC_CFG) & 1u << 26);
         EXPECT_EQ(0u, SimReadInternal32(0, DAC_MODE) & 1);
-        SimWriteRegister(0, SIM_REG_CRTC, 0x1A, 0x01);
-        SimWriteRegister(0, SIM_REG_CRTC, 0x1B, SimReadRegister(0, SIM_REG_CRTC, 0x1B) ^ 0x01);
-        EXPECT_EQ(t->htotal / 8 + 256, SimHTotal(0)) << "CR1A bit 0 is bit 8 of the total";
-        EXPECT_EQ(((t->vtotal - 2) ^ 1024) + 2, SimVTotal(0)) << "CR1B bit 0 is bit 10";
+        ExpectOverflowBits(t, 0x1A, 0x01, 0x1B, 0x01, 1024);  // bit 8 of the total, bit 10
     }
     std::string text = PrintedState();
     EXPECT_NE(std::string::npos, text.find("\npllCtrl0=")) << text.substr(text.size() - 300);

@@ -1,5 +1,5 @@
 // The NVIDIA model: the extended-register locks, the real-mode access port
-// against the register window, the synthesizers and straps, DPMS, and the
+// against the register window, the simstate names, DPMS, and the
 // display driver's mode set read back from the registers.
 #include <math.h>
 
@@ -7,7 +7,7 @@
 #include "sim_test.h"
 
 enum : uint16_t { TNT = 0x0020, RIVA128 = 0x0018 };
-const uint32_t MPLL = 0x680504, VPLL = 0x680508, STRAPS = 0x101000, PFB_BOOT = 0x100000;
+const uint32_t MPLL = 0x680504;
 
 static void BootRiva(uint16_t device, int memory_mb = 16, uint32_t crystal_hz = 14318180, int windows = SIM_WINDOWS_98)
 {
@@ -18,8 +18,6 @@ static void BootRiva(uint16_t device, int memory_mb = 16, uint32_t crystal_hz = 
     config.start_bits = 32;
     SimBoot(&config);
 }
-static uint32_t Bar0() { return SimCardBarAddress(0, 0); }
-static void Unlock(uint16_t device) { device == TNT ? WriteCr(0x1F, 0x57) : WriteSr(0x06, 0x57); }
 
 TEST(Riva, ExtendedCrtcOnlyBehindTheLock)
 {
@@ -44,26 +42,6 @@ TEST(Riva, ExtendedCrtcOnlyBehindTheLock)
     }
 }
 
-// 0x00018C0A: N = 140, M = 10, P = 1; the strap's bit 6 picks the crystal.
-TEST(Riva, SynthesizersStrapsAndMemorySize)
-{
-    const struct { uint16_t device; int mb; uint32_t crystal; double mclk_hz; int code; } cases[] = {
-        {TNT, 16, 14318180, 100227260, 3},
-        {TNT, 2, 13500000, 94500000, 0},  // the program's table; public tables read 0 as 32 MB
-        {RIVA128, 4, 14318180, 100227260, 2},
-        {RIVA128, 8, 14318180, 100227260, 0},
-    };
-    for (const auto& c : cases) {
-        BootRiva(c.device, c.mb, c.crystal);
-        SimWriteInternal32(0, MPLL, 0x00018C0A);
-        EXPECT_NEAR(c.mclk_hz, SimMemoryClockHz(0), 1) << c.crystal;
-        EXPECT_EQ(c.crystal != 13500000, (MachineReadDword(Bar0() + STRAPS) >> 6) & 1);
-        EXPECT_EQ(c.code, (int)(MachineReadDword(Bar0() + PFB_BOOT) & 3)) << c.mb;
-        MachineWriteDword(Bar0() + STRAPS, 0);
-        EXPECT_EQ(c.crystal != 13500000, (SimReadInternal32(0, STRAPS) >> 6) & 1) << "the straps are read-only";
-    }
-}
-
 // The driver's mode set, read back from CR00/CR2D, CR06/CR07/CR25 and the
 // VPLL, runs within 1 Hz of the timing's exact rate with either crystal.
 TEST(Riva, DmtModesRunAtTheirRates)
@@ -74,15 +52,9 @@ TEST(Riva, DmtModesRunAtTheirRates)
     };
     for (const auto& c : cases) {
         BootRiva(c.device, 8, c.crystal, SIM_WINDOWS_NT4);
-        ASSERT_TRUE(SimSetCardMode(0, c.w, c.h, 8, c.hz)) << c.w << "x" << c.h << "@" << c.hz;
-        const SimTiming* t = SimFindTiming(c.w, c.h, c.hz, false);
-        EXPECT_EQ(t->htotal / 8, SimHTotal(0));
-        EXPECT_EQ(t->vtotal, SimVTotal(0));
-        EXPECT_NEAR(SimTimingFrameRate(t), SimRefreshHz(0), 1.0) << c.w << "x" << c.h << "@" << c.hz;
-        SimWriteRegister(0, SIM_REG_CRTC, 0x2D, 0x01);
-        SimWriteRegister(0, SIM_REG_CRTC, 0x25, SimReadRegister(0, SIM_REG_CRTC, 0x25) ^ 0x01);
-        EXPECT_EQ(t->htotal / 8 + 256, SimHTotal(0)) << "CR2D bit 0 is bit 8 of the total";
-        EXPECT_EQ(((t->vtotal - 2) ^ 1024) + 2, SimVTotal(0)) << "CR25 bit 0 is bit 10";
+        const SimTiming* t;
+        ASSERT_NO_FATAL_FAILURE(SetDmtMode(c.w, c.h, 8, c.hz, &t));
+        ExpectOverflowBits(t, 0x2D, 0x01, 0x25, 0x01, 1024);  // bit 8 of the total, bit 10
     }
 }
 

@@ -52,6 +52,29 @@ inline std::string RegText(HKEY root, const std::string& path, const char* name)
     return ReadRegistryRaw(root, path, name).c_str();
 }
 
+// The display driver's mode set runs at the timing's rate with its totals, the
+// horizontal one in units of pixels_per_unit, within h_slack; asserts, so call it through
+// ASSERT_NO_FATAL_FAILURE.
+inline void SetDmtMode(int w, int h, int bits, int hz, const SimTiming** timing, int pixels_per_unit = 8,
+                       int h_slack = 0)
+{
+    ASSERT_TRUE(SimSetCardMode(0, w, h, bits, hz)) << w << "x" << h << "x" << bits << "@" << hz;
+    const SimTiming* t = *timing = SimFindTiming(w, h, hz, false);
+    EXPECT_NEAR(t->htotal / pixels_per_unit, SimHTotal(0), h_slack) << w << "x" << h;
+    EXPECT_EQ(t->vtotal, SimVTotal(0)) << w << "x" << h;
+    EXPECT_NEAR(SimTimingFrameRate(t), SimRefreshHz(0), 1.0) << w << "x" << h << "x" << bits << "@" << hz;
+}
+
+// Flips the CRTC bits above the total fields: the horizontal total (in
+// characters, less 5) moves by 256, the vertical one (less 2) by v_weight.
+inline void ExpectOverflowBits(const SimTiming* t, uint8_t h_index, uint8_t h_bit, uint8_t v_index, uint8_t v_bit, int v_weight)
+{
+    SimWriteRegister(0, SIM_REG_CRTC, h_index, SimReadRegister(0, SIM_REG_CRTC, h_index) ^ h_bit);
+    SimWriteRegister(0, SIM_REG_CRTC, v_index, SimReadRegister(0, SIM_REG_CRTC, v_index) ^ v_bit);
+    EXPECT_EQ(((t->htotal / 8 - 5) ^ 256) + 5, SimHTotal(0)) << std::hex << "CR" << +h_index;
+    EXPECT_EQ(((t->vtotal - 2) ^ v_weight) + 2, SimVTotal(0)) << std::hex << "CR" << +v_index;
+}
+
 // The machine as simstate.exe prints it.
 inline std::string PrintedState()
 {

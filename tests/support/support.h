@@ -5,6 +5,8 @@
 
 #include <windows.h>
 
+#include <string.h>
+
 #include <functional>
 #include <string>
 #include <vector>
@@ -51,5 +53,13 @@ struct DialogAnswerer {
 
 // The rates RefreshRateAt offers for a mode, in order, until the list ends.
 std::vector<int> OfferedRates(int width, int height, int bits);
+
+// Lines joined by '|', a line starting with indent shown as '~' and the rest.
+inline void AppendLine(std::string* all, const char* line, const char* indent)
+{
+    size_t n = strlen(indent);
+    bool indented = strncmp(line, indent, n) == 0;
+    *all += (all->empty() ? "" : "|") + (indented ? "~" + std::string(line + n) : std::string(line));
+}
 
 #endif
