@@ -1,6 +1,5 @@
 // The Banshee model: its synthesizers and memory set-up from known register
 // values, and the display driver's mode set read back from the registers.
-#include "modes.h"
 #include "sim_test.h"
 
 enum : uint32_t { DRAM_INIT0 = 0x18, PLL_CTRL0 = 0x40, PLL_CTRL2 = 0x48, DAC_MODE = 0x4C, VID_PROC_CFG = 0x5C };

@@ -1,7 +1,6 @@
 // The ET6000 model: the CLKDAC in the PCI I/O range found through CR21,
 // the clock number, DPMS, and the display driver's mode set read back from
 // the registers.
-#include "modes.h"
 #include "sim_test.h"
 
 static void BootEt6000(int windows = SIM_WINDOWS_98)

@@ -1,7 +1,6 @@
 // The i740 model: the XR index/data pair, the two clock sets chosen by the
 // MISC clock select, the memory clock choice, DPMS sync select, and the
 // display driver's mode set read back through CR30/CR35.
-#include "modes.h"
 #include "sim_test.h"
 
 static void BootI740(int windows = SIM_WINDOWS_98)

@@ -2,7 +2,6 @@
 // schemes, the memory configuration and the 66 MHz status bit, the sync
 // control, the display driver's mode set read back from the timing
 // generator, and the driver's timing list in the registry.
-#include "modes.h"
 #include "sim_test.h"
 
 enum : uint16_t { TI = 0x3d07, PM2 = 0x0007, PM2V = 0x0009 };

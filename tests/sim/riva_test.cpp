@@ -3,7 +3,6 @@
 // display driver's mode set read back from the registers.
 #include <math.h>
 
-#include "modes.h"
 #include "sim_test.h"
 
 enum : uint16_t { TNT = 0x0020, RIVA128 = 0x0018 };

@@ -6,6 +6,7 @@
 #include <gtest/gtest.h>
 
 #include "hardware/machine.h"
+#include "modes.h"
 #include "sim.h"
 #include "support/machine.h"
 #include "support/support.h"

@@ -1,6 +1,5 @@
 // The Trident model: the memory clock and the display driver's mode set
 // read back from the registers.
-#include "modes.h"
 #include "sim_test.h"
 
 static void BootTrident(int memory_mb = 4, int windows = SIM_WINDOWS_98)
