@@ -34,7 +34,8 @@ endfunction()
 # gatectl.exe asks the display driver about its memory through the machine
 # seam: the real PC's here, the simulated machine's in the sim build.
 vistrel_companion(gatectl "" SOURCES ${VISTREL_ROOT}/companions/gatectl.cpp ${VISTREL_ROOT}/companions/gate.cpp
-                  ${VISTREL_ROOT}/src/hardware/shutdown.cpp ${VISTREL_GATE_MACHINE} LIBS user32 gdi32 advapi32)
+                  ${VISTREL_ROOT}/companions/gate_command.cpp ${VISTREL_ROOT}/src/hardware/shutdown.cpp
+                  ${VISTREL_GATE_MACHINE} LIBS user32 gdi32 advapi32)
 # loupe.exe, the zoom tool the menu starts; its icon is the menu's magnifier.
 vistrel_companion(loupe ${VISTREL_ROOT}/resources/zoom.ico
                   SOURCES ${VISTREL_ROOT}/companions/loupe.cpp ${VISTREL_ROOT}/companions/loupe_command.cpp

@@ -6,22 +6,7 @@
 #include <windows.h>
 #include <stdint.h>
 
-enum GateCommand {
-    GATE_NONE = 0,
-    GATE_RESTART = 2,
-    GATE_MEMORY = 3,
-};
-
-enum { GATE_CLASS_SIZE = 256 };
-
-struct GateRequest {
-    int command;
-    char window_class[GATE_CLASS_SIZE];  // GATE_MEMORY: who gets the answer
-};
-
-// The arguments after the program name: "2 restart" or "3 <window class>".
-// Anything else is GATE_NONE and must not do anything.
-int ParseGateCommand(const char* arguments, GateRequest* request);
+#include "gate_command.h"
 
 // The memory-size format: whole megabytes << 16, OR the kilobytes beyond
 // them in steps of 64.

@@ -40,7 +40,7 @@ vistrel_add_test(sim sim)
 # The companions: gatectl.exe's work is linked in and driven in-process; two
 # helper programs stand in for gatectl.exe and for another process's window.
 vistrel_test(companions)
-target_sources(test-companions PRIVATE ${VISTREL_ROOT}/companions/gate.cpp ${VISTREL_ROOT}/companions/keep_call.cpp)
+target_sources(test-companions PRIVATE ${VISTREL_ROOT}/companions/gate.cpp ${VISTREL_ROOT}/companions/gate_command.cpp ${VISTREL_ROOT}/companions/keep_call.cpp)
 foreach(helper fake_gatectl input_window)
   string(REPLACE "_" "-" helper_name ${helper})
   add_executable(${helper_name} WIN32 ${VISTREL_ROOT}/tests/companions/helpers/${helper}.cpp)

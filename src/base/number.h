@@ -12,8 +12,9 @@
 // instead of wrapping.
 int32_t ParseNumber(const char* text, size_t length);
 
-// Refresh rates are kept in 16 bits: a larger number is not a rate.
+// Refresh rates are kept in 16 bits: a larger number is not a rate, nor is
+// a negative one (which would pass for "no list" or "cannot read").
 enum { RATE_HIGHEST = 0xFFFF };
-inline bool FitsRate(int32_t hz) { return hz <= RATE_HIGHEST; }
+inline bool FitsRate(int32_t hz) { return hz >= 0 && hz <= RATE_HIGHEST; }
 
 #endif

@@ -8,6 +8,7 @@
 #include "base/module_reset.h"
 #include "base/runtime.h"
 #include "base/state.h"
+#include "hardware/driver_key_path.h"
 #include "hardware/registry_text.h"
 
 static const char config_manager_enum[] = "Config Manager\\Enum";
@@ -59,15 +60,7 @@ int FindDriverKey(char* out)
     if (platform == PLATFORM_NT) {
         char path[DRIVER_KEY_SIZE];
         if (!ReadRegistryText(HKEY_LOCAL_MACHINE, nt_video_map, nt_video0_value, path, sizeof path)) return -1;
-        // "\Registry\Machine\System\..." -> "System\..."
-        const char* rest = path + 1;
-        for (int i = 0; i < 2 && rest; ++i) {
-            rest = FindChar(rest, '\\');
-            if (rest) ++rest;
-        }
-        if (!rest) return -1;
-        lstrcpynA(out, rest, DRIVER_KEY_SIZE);
-        return 1;
+        return DriverKeyFromDevicePath(path, out, DRIVER_KEY_SIZE);
     }
     char node[HARDWARE_KEY_SIZE], hardware_key[HARDWARE_KEY_SIZE];
     if (!FindDeviceNode(node, sizeof node, hardware_key, sizeof hardware_key)) return -1;

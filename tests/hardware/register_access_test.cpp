@@ -5,6 +5,7 @@
 #include "chips/chips.h"
 #include "hardware/driver_device.h"
 #include "hardware/driver_key.h"
+#include "hardware/driver_key_path.h"
 #include "hardware/pci.h"
 #include "hardware/register_access.h"
 #include "hardware/registry_text.h"
@@ -127,4 +128,21 @@ TEST(DriverKey, TheDeviceMapOnNtTheDeviceNodeOn9x)
     WriteRegistryString(HKEY_LOCAL_MACHINE, hardware, "Driver", "");
     EXPECT_EQ(-1, FindDriverKey(key));
     EXPECT_EQ(-1, DriverImageName(key));
+}
+
+// The NT device map's kernel path: an empty value is no key, whatever the
+// buffer holds past its terminator; a long key is cut to the buffer.
+TEST(DriverKeyPath, KernelPathToMachineKey)
+{
+    const char empty[] = "\0\\Registry\\Machine\\System\\Left";
+    const struct { const char* path; int result; const char* key; } cases[] = {
+        {"\\Registry\\Machine\\System\\Video", 1, "System\\"},
+        {"\\Registry\\Machine", -1, ""}, {empty, -1, ""},
+    };
+    for (const auto& c : cases) {
+        char key[8];
+        memset(key, '#', sizeof key);
+        EXPECT_EQ(c.result, DriverKeyFromDevicePath(c.path, key, sizeof key)) << c.path;
+        if (c.result == 1) EXPECT_EQ(std::string(c.key), key);
+    }
 }

@@ -16,6 +16,7 @@ TEST(RateList, ItemsCountsAndInsertion)
         {"75", RATE_LAST, 75}, {"", 0, 0}, {"60,abc,75", 1, 0}, {"60, 72", 1, 72}, {"60,72,", RATE_LAST, 0},
         {"60,65596,85", 1, 0},  // beyond 16 bits: not 60 in disguise
         {"65535", 0, 65535}, {"60,72", -2, 0}, {NULL, 0, 0},
+        {"60,-1", RATE_LAST, 0}, {"-5,60", 0, 0},  // negative: neither a rate nor "no list"
     };
     for (const auto& c : cases) EXPECT_EQ(c.rate, ParseRateList(c.text, c.index)) << (c.text ? c.text : "NULL") << " " << c.index;
     EXPECT_EQ(3, CountRateListItems("56,60,72"));
