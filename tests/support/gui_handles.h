@@ -9,16 +9,15 @@
 
 #include <string>
 
-// "gdi G user U": U counts this process's windows, menus and icons/cursors.
+// "gdi G user U": U counts this thread's windows (Wine's own threads of the
+// process make theirs when they like), this process's menus and icons/cursors.
 inline std::string GuiHandles()
 {
     int gdi = 0, windows = 0, menus = 0, icons = 0;
     for (UINT_PTR slot = 1; slot < 0x10000; ++slot) gdi += GetObjectType((HGDIOBJ)slot) != 0;
-    // USER handles are even from 0x20; a window of another process is not ours.
+    // USER handles are even from 0x20.
     for (UINT_PTR slot = 0x20; slot < 0x10000; slot += 2) {
-        DWORD process = 0;
-        if (IsWindow((HWND)slot) && GetWindowThreadProcessId((HWND)slot, &process) && process == GetCurrentProcessId())
-            ++windows;
+        windows += IsWindow((HWND)slot) && GetWindowThreadProcessId((HWND)slot, NULL) == GetCurrentThreadId();
         menus += IsMenu((HMENU)slot) != 0;
         ICONINFO info;
         if (GetIconInfo((HICON)slot, &info)) {  // copies the icon's bitmaps
