@@ -230,7 +230,13 @@ static INT_PTR CALLBACK PanningDialogProc(HWND dialog, UINT message, WPARAM wpar
         else if (LOWORD(wparam) == IDC_PANNING_SAVE) Close(dialog, 1);
         else return FALSE;
         return TRUE;
-    case WM_DESTROY: FreePictures(); return FALSE;
+    case WM_DESTROY:
+        FreePictures();
+        // The corner picture's control loaded its bitmap from the template
+        // but does not delete it when it goes.
+        if (HGDIOBJ corner = (HGDIOBJ)SendDlgItemMessageA(dialog, IDB_PANNING_CORNER, STM_SETIMAGE, IMAGE_BITMAP, 0))
+            DeleteObject(corner);
+        return FALSE;
     }
     return FALSE;
 }

@@ -71,6 +71,14 @@ static void ShowMonitorInfo(HWND page)
     ShowWindow(GetDlgItem(page, IDC_MONITOR_LIST), SW_HIDE);
 }
 
+// The picture control loaded its bitmap from the template but does not
+// delete it when it goes: take it back and delete it here.
+static void FreePicture(HWND page)
+{
+    HGDIOBJ picture = (HGDIOBJ)SendDlgItemMessageA(page, IDC_MONITOR_NT_PICTURE, STM_SETIMAGE, IMAGE_BITMAP, 0);
+    if (picture) DeleteObject(picture);
+}
+
 static void OnInitDialog(HWND page)
 {
     if (CurrentAdapter()->flags & ADAPTER_NO_ADJUST) {
@@ -136,6 +144,7 @@ INT_PTR CALLBACK MonitorPageProc(HWND page, UINT message, WPARAM wparam, LPARAM 
     switch (message) {
     case WM_INITDIALOG: OnInitDialog(page); return TRUE;
     case WM_COMMAND: OnCommand(page, LOWORD(wparam)); return TRUE;
+    case WM_DESTROY: FreePicture(page); return FALSE;
     case WM_NOTIFY:
         if (((const NMHDR*)lparam)->code != (UINT)PSN_APPLY) return FALSE;
         OnApply(page);

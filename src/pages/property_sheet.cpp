@@ -67,12 +67,21 @@ int StartPosition(unsigned included, int requested_page)
     return before > 0 ? before - 1 : 0;
 }
 
+// The sheet takes copies of the icons it is handed; what it loads itself
+// from icon ids it never frees, so every opening would keep them.
+static HICON SmallIcon(HINSTANCE inst, int id)
+{
+    return (HICON)LoadImageA(inst, MAKEINTRESOURCEA(id), IMAGE_ICON, GetSystemMetrics(SM_CXSMICON),
+                             GetSystemMetrics(SM_CYSMICON), 0);
+}
+
 void OpenPropertySheet(HINSTANCE inst, HWND owner, int requested_page)
 {
     char caption[CAPTION_SIZE];
     LoadText("CAPTION", "Vistrel", caption, sizeof caption);
 
     PROPSHEETPAGEA_V1 pages[PAGE_COUNT];
+    HICON icons[PAGE_COUNT + 1] = {};  // the pages' and the sheet's
     unsigned included = 0;
     int count = 0;
     for (int page = 0; page < PAGE_COUNT; ++page) {
@@ -83,10 +92,10 @@ void OpenPropertySheet(HINSTANCE inst, HWND owner, int requested_page)
         PROPSHEETPAGEA_V1& p = pages[count++];
         memset(&p, 0, sizeof p);
         p.dwSize = PROPSHEETPAGEA_V1_SIZE;
-        p.dwFlags = PSP_USEICONID | PSP_USETITLE;
         p.hInstance = inst;
         p.pszTemplate = MAKEINTRESOURCEA(ChoosePageTemplate(page));
-        p.pszIcon = MAKEINTRESOURCEA(label.icon);
+        p.hIcon = icons[count - 1] = SmallIcon(inst, label.icon);
+        p.dwFlags = PSP_USETITLE | (p.hIcon ? PSP_USEHICON : 0);
         p.pszTitle = page_titles[page];
         p.pfnDlgProc = page_procedures[page];
     }
@@ -95,15 +104,17 @@ void OpenPropertySheet(HINSTANCE inst, HWND owner, int requested_page)
     PROPSHEETHEADERA header;
     memset(&header, 0, sizeof header);
     header.dwSize = PROPSHEETHEADERA_V1_SIZE;
-    header.dwFlags = PSH_PROPSHEETPAGE | PSH_USEICONID;
     header.hwndParent = owner;
     header.hInstance = inst;
-    header.pszIcon = MAKEINTRESOURCEA(IDI_SHEET);
+    header.hIcon = icons[PAGE_COUNT] = SmallIcon(inst, IDI_SHEET);
+    header.dwFlags = PSH_PROPSHEETPAGE | (header.hIcon ? PSH_USEHICON : 0);
     header.pszCaption = caption;
     header.nPages = (UINT)count;
     header.nStartPage = (UINT)StartPosition(included, requested_page);
     header.ppsp = (LPCPROPSHEETPAGEA)pages;
     PropertySheetA(&header);
+    for (HICON icon : icons)
+        if (icon) DestroyIcon(icon);
 }
 
 void SetPageTexts(HWND page, const PageText* texts, int count)

@@ -3,6 +3,7 @@
 #include "adjust/adjust_pattern.h"
 #include "adjust/adjust_test.h"
 #include "hardware/multimon.h"
+#include "support/gui_handles.h"
 
 namespace {
 
@@ -83,6 +84,19 @@ TEST_F(AdjustTest, EnterAsksWithNoAsTheDefaultAndYesStores)
     LoadLegendTexts(&t);
     EXPECT_EQ("Nach oben|Down|Left|Right||Soll dies",
               std::string(t.up) + "|" + t.down + "|" + t.left + "|" + t.right + "|" + t.cancel + "|" + t.save);
+}
+
+// 200 windows, each painted, stepped and closed, every other one through the save question, leave the
+// handles as they were.
+TEST_F(AdjustTest, WindowsKeepNoHandle)
+{
+    question.answer = IDNO;
+    auto one = [](int i) { Keys({{VK_UP, 1}, {i % 2 ? VK_ESCAPE : VK_RETURN, 1}}); };
+    one(0), one(1);  // the first load what stays: the message box's
+    const std::string before = GuiHandles();
+    for (int i = 0; i < 200; ++i) one(i);
+    EXPECT_EQ(before, GuiHandles());
+    EXPECT_FALSE(FindWindowA(adjust_window_class, NULL));
 }
 
 // The nested rectangles' corners sit on the diagonals whatever the proportions;

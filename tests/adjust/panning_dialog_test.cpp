@@ -3,6 +3,7 @@
 #include "adjust/adjust_resources.h"
 #include "adjust/adjust_test.h"
 #include "adjust/panning_dialog.h"
+#include "support/gui_handles.h"
 
 namespace {
 
@@ -108,6 +109,19 @@ TEST_F(PanningDialogTest, ArrowsStepAutoGoesBackSaveStoresAndCancelUndoes)
                                      {NORMAL, 0x81, 772, none, false, IDCANCEL}};
     EXPECT_EQ(0, RunScript(cancelled, 2));
     EXPECT_TRUE(Crtc(0x04) == 0x80 && !StoredValue("1024x768x16x75H", &value)) << "undone";
+}
+
+// 200 dialogs, each painted, stepped and cancelled, leave the handles as they were.
+TEST_F(PanningDialogTest, DialogsKeepNoHandle)
+{
+    static const Step steps[] = {{IDB_PAD_NORMAL, 0x84, 771, left_arrow, true, 0},
+                                 {IDB_PAD_NORMAL, 0x85, 771, none, false, IDCANCEL}};
+    std::string before;
+    for (int i = -2; i < 200; ++i) {
+        if (i == 0) before = GuiHandles();  // the first load what stays
+        ASSERT_EQ(0, RunScript(steps, 2));
+    }
+    EXPECT_EQ(before, GuiHandles());
 }
 
 }  // namespace

@@ -24,6 +24,8 @@
 #include "pages/monitor_info.h"
 #include "pages/property_sheet.h"
 #include "pages/sheet.h"
+#include "support/gui_handles.h"
+#include "support/import_slot.h"
 #include "support/machine.h"
 
 static std::function<void(HWND sheet)> step;
@@ -174,6 +176,50 @@ TEST(Sheet, StaysInsideTheWorkArea)
     DestroyWindow(corner);
     RECT inside;
     EXPECT_TRUE(IntersectRect(&inside, &placed, &work) && EqualRect(&inside, &placed));
+}
+
+// Every other opening is as on a Japanese system: its templates, and the Performance page's own font.
+bool japanese;
+LANGID(WINAPI* real_language)();
+LANGID WINAPI JapaneseOrReal() { return japanese ? MAKELANGID(LANG_JAPANESE, SUBLANG_DEFAULT) : real_language(); }
+
+// Once the sheet first shows, its queue gets a visit to every page and then Cancel: no timer to wait on.
+bool visit_posted;
+LRESULT CALLBACK VisitAndCancel(int code, WPARAM wparam, LPARAM lparam)
+{
+    HWND sheet = (HWND)wparam;
+    if (code == HCBT_ACTIVATE && !visit_posted && PropSheet_GetTabControl(sheet)) {
+        visit_posted = true;
+        for (int page = PAGE_INFORMATION; page <= PAGE_PERFORMANCE; ++page) PostMessageA(sheet, PSM_SETCURSEL, page, 0);
+        PostMessageA(sheet, PSM_PRESSBUTTON, PSBTN_CANCEL, 0);
+    }
+    return CallNextHookEx(NULL, code, wparam, lparam);
+}
+
+// 200 openings and closings, all four pages visited, leave the handles as they were.
+TEST(Sheet, OpeningsKeepNoHandle)
+{
+    BootMachine(Machine(SIM_WINDOWS_98, {Card(0x10de, 0x0020, 1, 0)}));
+    ASSERT_EQ(1, DetectAdapters());
+    RefreshAdapterModes(REFRESH_AT_STARTUP);
+    if (!real_language)
+        real_language = (decltype(real_language))RedirectImport("kernel32.dll", "GetSystemDefaultLangID", (FARPROC)JapaneseOrReal);
+    ASSERT_TRUE(real_language);
+    int tabs = 0;
+    ASSERT_TRUE(RunSheet(PAGE_DESKTOP, [&](HWND sheet) { tabs = TabCtrl_GetItemCount(PropSheet_GetTabControl(sheet)); }));
+    ASSERT_EQ(4, tabs);
+    HHOOK hook = SetWindowsHookExA(WH_CBT, VisitAndCancel, NULL, GetCurrentThreadId());
+    std::string before;
+    for (int i = -6; i < 200; ++i) {
+        if (i == 0) before = GuiHandles();  // the first openings load what stays: controls' classes, caches
+        japanese = i & 1;
+        visit_posted = false;
+        OpenPropertySheet(instance, NULL, PAGE_DESKTOP);
+        ASSERT_TRUE(visit_posted) << i;
+    }
+    UnhookWindowsHookEx(hook);
+    japanese = false;
+    EXPECT_EQ(before, GuiHandles());
 }
 
 std::string keep_calls;  // the hook library's calls, "state,enable,minutes;" each

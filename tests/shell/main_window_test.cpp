@@ -15,6 +15,7 @@
 #include "shell/startup.h"
 #include "shell/tray.h"
 #include "shell/tray_menu.h"
+#include "support/gui_handles.h"
 #include "support/machine.h"
 
 namespace {
@@ -173,17 +174,15 @@ TEST_F(MainWindow, MenuOffersWhatTheChipsAllow)
     }
 }
 
-TEST_F(MainWindow, MenuIconsAndDrawingKeepNoGdiObject)
+TEST_F(MainWindow, MenuIconsAndDrawingKeepNoHandle)
 {
     ASSERT_NO_FATAL_FAILURE(Start(SIM_WINDOWS_98, 2));
-    // Wine's GetGuiResources answers 0: the handle table is walked instead.
-    auto objects = [] { int n = 0; for (UINT_PTR i = 0; i < 0x10000; ++i) n += !!GetObjectType((HGDIOBJ)i); return n; };
-    const int built = objects();
-    BuildTrayMenu();
-    EXPECT_EQ(built, objects()) << "the icons of the menu before go";
     const ULONG_PTR close = (ULONG_PTR)MenuRecordOfCommand(MENU_CLOSE);
     MEASUREITEMSTRUCT measure = {ODT_MENU, 0, MENU_CLOSE, 0, 0, close};
-    SendMessageA(stand_in, WM_MEASUREITEM, 0, (LPARAM)&measure);
+    SendMessageA(stand_in, WM_MEASUREITEM, 0, (LPARAM)&measure);  // the screen's DC stays from the first
+    const std::string built = GuiHandles();
+    BuildTrayMenu();
+    EXPECT_EQ(built, GuiHandles()) << "the menus and icons of the menu before go";
     HDC dc = CreateCompatibleDC(NULL);
     SIZE text = {};
     GetTextExtentPoint32A(dc, "Close", 5, &text);
@@ -200,17 +199,18 @@ TEST_F(MainWindow, MenuIconsAndDrawingKeepNoGdiObject)
         {ODA_DRAWENTIRE, ODS_SELECTED, close, menu, ink}, {ODA_SELECT, ODS_SELECTED, close, lit, lit_ink},
         {ODA_SELECT, 0, close, menu, ink}, {ODA_FOCUS, ODS_FOCUS, close, lit, lit_ink},
         {ODA_DRAWENTIRE, 0, (ULONG_PTR)&stranger, junk, lit_ink}};
-    for (int i = 0; i < 100; ++i) {  // and again, for a leak to add up
+    for (int i = 0; i < 1000; ++i) {  // and again, for a leak to add up
         const auto& row = rows[i % 5];
         std::fill(bits, bits + 200 * 40, 0x010203u);
         DRAWITEMSTRUCT draw = {ODT_MENU, 0, MENU_CLOSE, row.action, row.state, NULL, dc, {10, 2, 150, 38}, row.data};
+        SendMessageA(stand_in, WM_MEASUREITEM, 0, (LPARAM)&measure);
         SendMessageA(stand_in, WM_DRAWITEM, 0, (LPARAM)&draw);
         ASSERT_TRUE(GetPixel(dc, 149, 37) == row.background && GetPixel(dc, 150, 38) == junk &&
                     GetTextColor(dc) == row.text && GetCurrentObject(dc, OBJ_BRUSH) == own_brush) << "row " << i % 5;
     }
     DeleteObject(SelectObject(dc, old_bitmap));
     DeleteDC(dc);
-    EXPECT_EQ(built, objects());
+    EXPECT_EQ(built, GuiHandles());
 }
 
 TEST(TaskbarCorner, MainWindowSpotIsTheCornerAtTheFarEndOfTheTaskbar)
