@@ -225,31 +225,11 @@ void Reset(int card)
     SetPll(card, PLL_CTRL0, vga_clock_hz[0]);
 }
 
-// The total in characters of 8 pixels less 5, in units of the register
-// (two characters in 2X mode), rounded half up.
-SimCrtcTiming CrtcValues(const SimTiming* t, int pixels)
-{
-    SimCrtcTiming c;
-    c.htotal = ((t->htotal + 4) / 8 - 5 + pixels / 16) * 8 / pixels;
-    c.hdisplay_end = t->width / pixels - 1;
-    c.hblank_start = t->width / pixels;
-    c.hblank_end = t->htotal / pixels - 1;
-    c.hsync_start = t->hsync_start / pixels;
-    c.hsync_end = t->hsync_end / pixels;
-    c.vtotal = t->vtotal - 2;
-    c.vdisplay_end = t->height - 1;
-    c.vblank_start = t->height;
-    c.vblank_end = t->vtotal - 1;
-    c.vsync_start = t->vsync_start;
-    c.vsync_end = t->vsync_end;
-    return c;
-}
-
 void ProgramMode(int card, const SimTiming* t, int bits)
 {
     SimVga* v = Core(card);
     bool twice = t->width >= twice_min_width;
-    SimCrtcTiming c = CrtcValues(t, twice ? 16 : 8);
+    SimCrtcTiming c = VgaCrtcValues(t, twice ? 16 : 8);
     v->cr[0x1A] = 0;
     v->cr[0x1B] = 0;
     VgaWriteTiming(card, &c, &crtc);

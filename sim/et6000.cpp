@@ -61,30 +61,23 @@ constexpr Et6000Fields fields = {
     .rgb_565 = Bit(IO_RGB_565, 1),
 };
 
-constexpr SimField With(const SimField& vga, uint8_t reg, uint8_t bit)
-{
-    SimField f = vga;
-    f.pieces[f.piece_count++] = {.reg = reg, .low_bit = bit, .high_bit = bit};
-    return f;
-}
-
 // Bit 8 of the horizontal total, display end, blanking start and retrace
 // start in CR3F bits 0, 1, 2 and 4; bit 10 of the vertical blanking start,
 // total, display end, retrace start and line compare in CR35 bits 0-4.
 const SimCrtcFields crtc = {
-    .htotal = With(sim_vga_crtc.htotal, 0x3F, 0),
-    .hdisplay_end = With(sim_vga_crtc.hdisplay_end, 0x3F, 1),
-    .hblank_start = With(sim_vga_crtc.hblank_start, 0x3F, 2),
+    .htotal = SimFieldWithBit(sim_vga_crtc.htotal, 0x3F, 0),
+    .hdisplay_end = SimFieldWithBit(sim_vga_crtc.hdisplay_end, 0x3F, 1),
+    .hblank_start = SimFieldWithBit(sim_vga_crtc.hblank_start, 0x3F, 2),
     .hblank_end = sim_vga_crtc.hblank_end,
-    .hsync_start = With(sim_vga_crtc.hsync_start, 0x3F, 4),
+    .hsync_start = SimFieldWithBit(sim_vga_crtc.hsync_start, 0x3F, 4),
     .hsync_end = sim_vga_crtc.hsync_end,
-    .vtotal = With(sim_vga_crtc.vtotal, 0x35, 1),
-    .vdisplay_end = With(sim_vga_crtc.vdisplay_end, 0x35, 2),
-    .vblank_start = With(sim_vga_crtc.vblank_start, 0x35, 0),
+    .vtotal = SimFieldWithBit(sim_vga_crtc.vtotal, 0x35, 1),
+    .vdisplay_end = SimFieldWithBit(sim_vga_crtc.vdisplay_end, 0x35, 2),
+    .vblank_start = SimFieldWithBit(sim_vga_crtc.vblank_start, 0x35, 0),
     .vblank_end = sim_vga_crtc.vblank_end,
-    .vsync_start = With(sim_vga_crtc.vsync_start, 0x35, 3),
+    .vsync_start = SimFieldWithBit(sim_vga_crtc.vsync_start, 0x35, 3),
     .vsync_end = sim_vga_crtc.vsync_end,
-    .line_compare = With(sim_vga_crtc.line_compare, 0x35, 4),
+    .line_compare = SimFieldWithBit(sim_vga_crtc.line_compare, 0x35, 4),
 };
 
 // X.org tseng's search for the pixel clock: M 1..127, N 1..31, R 1..3 (R 0
@@ -235,28 +228,10 @@ void Reset(int card)
 
 // --- the display driver's mode set (X.org tseng's TsengModeInit) ---
 
-SimCrtcTiming CrtcValues(const SimTiming* t)
-{
-    SimCrtcTiming c;
-    c.htotal = (t->htotal + 4) / 8 - 5;
-    c.hdisplay_end = t->width / 8 - 1;
-    c.hblank_start = t->width / 8;
-    c.hblank_end = t->htotal / 8 - 1;
-    c.hsync_start = t->hsync_start / 8;
-    c.hsync_end = t->hsync_end / 8;
-    c.vtotal = t->vtotal - 2;
-    c.vdisplay_end = t->height - 1;
-    c.vblank_start = t->height;
-    c.vblank_end = t->vtotal - 1;
-    c.vsync_start = t->vsync_start;
-    c.vsync_end = t->vsync_end;
-    return c;
-}
-
 void ProgramMode(int card, const SimTiming* t, int bits)
 {
     SimVga* v = Core(card);
-    SimCrtcTiming c = CrtcValues(t);
+    SimCrtcTiming c = VgaCrtcValues(t);
     int bytes = (bits + 7) / 8;
     // The overflow registers are written whole.
     v->cr[0x35] = 0;

@@ -29,6 +29,13 @@ int SimFieldRead(const uint8_t* regs, const SimField* field);
 void SimFieldWrite(uint8_t* regs, const SimField* field, int value);
 // Width of a field in bits.
 int SimFieldWidth(const SimField* field);
+// A field with one more bit above its others: a family's overflow bit.
+constexpr SimField SimFieldWithBit(const SimField& field, uint8_t reg, uint8_t bit)
+{
+    SimField f = field;
+    f.pieces[f.piece_count++] = {.reg = reg, .low_bit = bit, .high_bit = bit};
+    return f;
+}
 
 // The CRT controller's timing fields as the IBM VGA has them (8 horizontal
 // bits, 10 vertical, the overflow bits in CR07 and CR09).

@@ -175,6 +175,10 @@ struct SimCrtcTiming {
 // family's with its overflow bits) and leaves CR11 bit 7 set, as a mode set
 // by the BIOS or a driver does.
 void VgaWriteTiming(int card, const SimCrtcTiming* t, const struct SimCrtcFields* fields);
+// The CRT values of a VESA timing in characters of pixels (8, or 16 where a
+// register unit counts two characters): the total less 5, rounded half up;
+// vertical ones in lines.
+SimCrtcTiming VgaCrtcValues(const SimTiming* t, int pixels = 8);
 
 // --- pci.cpp ---
 void PciReset();

@@ -257,28 +257,10 @@ void Reset(int card)
 
 // --- the display driver's mode set ---
 
-SimCrtcTiming CrtcValues(const SimTiming* t)
-{
-    SimCrtcTiming c;
-    c.htotal = (t->htotal + 4) / 8 - 5;
-    c.hdisplay_end = t->width / 8 - 1;
-    c.hblank_start = t->width / 8;
-    c.hblank_end = t->htotal / 8 - 1;
-    c.hsync_start = t->hsync_start / 8;
-    c.hsync_end = t->hsync_end / 8;
-    c.vtotal = t->vtotal - 2;
-    c.vdisplay_end = t->height - 1;
-    c.vblank_start = t->height;
-    c.vblank_end = t->vtotal - 1;
-    c.vsync_start = t->vsync_start;
-    c.vsync_end = t->vsync_end;
-    return c;
-}
-
 void ProgramMode(int card, const SimTiming* t, int bits)
 {
     SimVga* v = Core(card);
-    SimCrtcTiming c = CrtcValues(t);
+    SimCrtcTiming c = VgaCrtcValues(t);
     // The extended overflow registers are written whole.
     v->cr[0x25] = 0;
     v->cr[0x2D] = 0;

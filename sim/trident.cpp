@@ -54,31 +54,24 @@ constexpr TridentFields fields = {
     .offset = {.piece_count = 2, .pieces = {{.reg = 0x13, .low_bit = 0, .high_bit = 7}, {.reg = 0x29, .low_bit = 4, .high_bit = 5}}},
 };
 
-SimField With(const SimField& vga, uint8_t reg, uint8_t bit)
-{
-    SimField f = vga;
-    f.pieces[f.piece_count++] = {.reg = reg, .low_bit = bit, .high_bit = bit};
-    return f;
-}
-
 // Bit 8 of the horizontal total, display end, retrace start and blanking
 // start in CR2B bits 0, 1, 3 and 4 (HorizOverflow); bit 10 of the vertical
 // total, blanking start, retrace start, display end and line compare in
 // CR27 bits 7, 6, 5, 4 and 3 (CRTHiOrd).
 const SimCrtcFields crtc = {
-    .htotal = With(sim_vga_crtc.htotal, 0x2B, 0),
-    .hdisplay_end = With(sim_vga_crtc.hdisplay_end, 0x2B, 1),
-    .hblank_start = With(sim_vga_crtc.hblank_start, 0x2B, 4),
+    .htotal = SimFieldWithBit(sim_vga_crtc.htotal, 0x2B, 0),
+    .hdisplay_end = SimFieldWithBit(sim_vga_crtc.hdisplay_end, 0x2B, 1),
+    .hblank_start = SimFieldWithBit(sim_vga_crtc.hblank_start, 0x2B, 4),
     .hblank_end = sim_vga_crtc.hblank_end,
-    .hsync_start = With(sim_vga_crtc.hsync_start, 0x2B, 3),
+    .hsync_start = SimFieldWithBit(sim_vga_crtc.hsync_start, 0x2B, 3),
     .hsync_end = sim_vga_crtc.hsync_end,
-    .vtotal = With(sim_vga_crtc.vtotal, 0x27, 7),
-    .vdisplay_end = With(sim_vga_crtc.vdisplay_end, 0x27, 4),
-    .vblank_start = With(sim_vga_crtc.vblank_start, 0x27, 6),
+    .vtotal = SimFieldWithBit(sim_vga_crtc.vtotal, 0x27, 7),
+    .vdisplay_end = SimFieldWithBit(sim_vga_crtc.vdisplay_end, 0x27, 4),
+    .vblank_start = SimFieldWithBit(sim_vga_crtc.vblank_start, 0x27, 6),
     .vblank_end = sim_vga_crtc.vblank_end,
-    .vsync_start = With(sim_vga_crtc.vsync_start, 0x27, 5),
+    .vsync_start = SimFieldWithBit(sim_vga_crtc.vsync_start, 0x27, 5),
     .vsync_end = sim_vga_crtc.vsync_end,
-    .line_compare = With(sim_vga_crtc.line_compare, 0x27, 3),
+    .line_compare = SimFieldWithBit(sim_vga_crtc.line_compare, 0x27, 3),
 };
 
 // CR1F 3..0 for the sizes the chip reports (tridentfb).
@@ -185,31 +178,13 @@ void Reset(int card)
 
 // --- the display driver's mode set (tridentfb's set_par) ---
 
-SimCrtcTiming CrtcValues(const SimTiming* t)
-{
-    SimCrtcTiming c;
-    c.htotal = (t->htotal + 4) / 8 - 5;
-    c.hdisplay_end = t->width / 8 - 1;
-    c.hblank_start = t->width / 8;
-    c.hblank_end = t->htotal / 8 - 1;
-    c.hsync_start = t->hsync_start / 8;
-    c.hsync_end = t->hsync_end / 8;
-    c.vtotal = t->vtotal - 2;
-    c.vdisplay_end = t->height - 1;
-    c.vblank_start = t->height;
-    c.vblank_end = t->vtotal - 1;
-    c.vsync_start = t->vsync_start;
-    c.vsync_end = t->vsync_end;
-    return c;
-}
-
 // CR38 (PixelBusReg) for a depth, as tridentfb and X.org trident set it.
 uint8_t PixelBus(int bits) { return bits == 8 ? 0x00 : bits == 15 ? 0x04 : bits == 16 ? 0x05 : 0x09; }
 
 void ProgramMode(int card, const SimTiming* t, int bits)
 {
     SimVga* v = Core(card);
-    SimCrtcTiming c = CrtcValues(t);
+    SimCrtcTiming c = VgaCrtcValues(t);
     // The overflow registers are written whole.
     v->cr[0x27] = 0;
     v->cr[0x2B] = 0;

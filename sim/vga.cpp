@@ -230,3 +230,21 @@ const SimFamilyOps sim_vga_ops = {
     .read_internal32 = NULL,
     .write_internal32 = NULL,
 };
+
+SimCrtcTiming VgaCrtcValues(const SimTiming* t, int pixels)
+{
+    SimCrtcTiming c;
+    c.htotal = ((t->htotal + 4) / 8 - 5 + pixels / 16) * 8 / pixels;
+    c.hdisplay_end = t->width / pixels - 1;
+    c.hblank_start = t->width / pixels;
+    c.hblank_end = t->htotal / pixels - 1;
+    c.hsync_start = t->hsync_start / pixels;
+    c.hsync_end = t->hsync_end / pixels;
+    c.vtotal = t->vtotal - 2;
+    c.vdisplay_end = t->height - 1;
+    c.vblank_start = t->height;
+    c.vblank_end = t->vtotal - 1;
+    c.vsync_start = t->vsync_start;
+    c.vsync_end = t->vsync_end;
+    return c;
+}
