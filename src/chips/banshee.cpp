@@ -93,7 +93,7 @@ static void WritePll(uint32_t offset, SynthSetting s)
 static uint32_t WholeMegahertz(SynthSetting s)
 {
     if (s.m == 0 || s.n == 0) return 0;
-    return (uint32_t)(SynthFrequency(&banshee_pll_limits, s) / 1e6 + 0.5);
+    return WholeMegahertz(SynthFrequency(&banshee_pll_limits, s));
 }
 
 uint32_t BansheeSynthMhz(uint16_t value)

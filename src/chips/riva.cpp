@@ -9,6 +9,7 @@
 #include "chips/chip_io.h"
 #include "chips/chips.h"
 #include "chips/reg_field.h"
+#include "chips/synth.h"
 #include "hardware/driver_key.h"
 #include "hardware/machine.h"
 #include "hardware/register_access.h"
@@ -234,7 +235,6 @@ static double PllHz(RivaPll pll)
     return fref_hz * pll.n / ((double)pll.m * (double)(1u << pll.p));
 }
 
-static uint32_t WholeMegahertz(double hz) { return (uint32_t)(hz / 1e6 + 0.5); }
 
 // N for a target from M and P, in the chip code's 16-bit arithmetic: a
 // product beyond 32 bits stands for a huge N.

@@ -267,7 +267,6 @@ static void CommitClock(const S3ClockFields* f, SynthSetting s)
     if (f->screen_off) WriteSeq(SR01_CLOCKING, clocking);
 }
 
-static uint32_t WholeMegahertz(double hz) { return (uint32_t)(hz / 1e6 + 0.5); }
 
 static uint32_t GetMemoryClock()
 {

@@ -24,6 +24,9 @@ inline constexpr double reference_crystal_hz = 14318180.0;
 
 double SynthFrequency(const SynthLimits* limits, SynthSetting s);
 
+// A clock in whole MHz, rounded half up, as the memory-clock commands answer.
+inline uint32_t WholeMegahertz(double hz) { return (uint32_t)(hz / 1e6 + 0.5); }
+
 // Looks for M, N, R that put the target within the VCO window, starting from
 // the current N and R in *setting: M follows from N and R, and N (then R)
 // moves by one until M fits, for at most 20 steps. Returns 1 with the fit in
